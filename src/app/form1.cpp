@@ -1,0 +1,354 @@
+#include "app/form1.h"
+
+#include "app/dialogs.h"
+#include "app/settings.h"
+#include "app/trap.h"
+#include "app/twips.h"
+#include "app/windowpointer.h"
+#include "names/database.h"
+
+#include <QButtonGroup>
+#include <QCloseEvent>
+#include <QCoreApplication>
+#include <QGroupBox>
+#include <QHeaderView>
+#include <QKeyEvent>
+#include <QLineEdit>
+#include <QProgressBar>
+#include <QPushButton>
+#include <QRadioButton>
+#include <QTreeView>
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const QString PaneToolTip = u"Move bar to right and out of window to reveal full names."_s;
+
+const QString HelpText =
+    u"You have two options for generating: \r\r"
+    "1. You can generate from Orvell's List which contains my collection of first and last "
+    "names.\r\r"
+    "2. You can generate using your User List. In this case, names can be loaded from a text "
+    "file or added one at a time."_s;
+
+template <typename Control>
+Control* place(QWidget* container, const QString& name, QRect geometry)
+{
+    auto* control = new Control(container);
+    control->setObjectName(name);
+    control->setGeometry(geometry);
+    return control;
+}
+
+QPushButton* button(QWidget* container, const QString& name, const QString& caption,
+                    QRect geometry)
+{
+    auto* b = place<QPushButton>(container, name, geometry);
+    b->setText(caption);
+    b->setAccessibleName(caption);
+    b->setFont(arialBold(11.25));
+    return b;
+}
+
+QGroupBox* frame(QWidget* container, const QString& name, const QString& caption,
+                 QRect geometry)
+{
+    auto* f = place<QGroupBox>(container, name, geometry);
+    f->setTitle(caption);
+    f->setAccessibleName(caption);
+    f->setAutoFillBackground(true);
+    return f;
+}
+
+QRadioButton* option(QWidget* container, const QString& name, const QString& caption,
+                     QRect geometry)
+{
+    auto* o = place<QRadioButton>(container, name, geometry);
+    o->setText(caption);
+    o->setAccessibleName(caption);
+    o->setAutoFillBackground(true);
+    return o;
+}
+
+QTreeView* pane(QWidget* container, const QString& name, const QString& caption,
+                PaneModel& model)
+{
+    auto* view = place<QTreeView>(container, name, twipsRect(240, 300, 7320, 1320));
+    view->setModel(&model);
+    view->setRootIsDecorated(false);
+    view->setUniformRowHeights(true);
+    view->setItemsExpandable(false);
+    view->setEditTriggers(QAbstractItemView::NoEditTriggers);
+    view->setSelectionMode(QAbstractItemView::SingleSelection);
+    view->setToolTip(PaneToolTip);
+    view->setAccessibleName(caption);
+    view->header()->setStretchLastSection(false);
+    view->header()->setSectionsMovable(false);
+    return view;
+}
+
+} // namespace
+
+Form1::Form1(Environment& environment, QWidget* parent)
+    : QWidget(parent)
+    , m_env(environment)
+    , m_pointer(new WindowPointer(this))
+    , m_sourceGroup(new QButtonGroup(this))
+    , m_genderGroup(new QButtonGroup(this))
+    , m_lists(namesDatabasePath(environment.programFolder), *m_pointer)
+{
+    buildLayout();
+    wireHandlers();
+}
+
+Form1::~Form1() = default;
+
+PointerOwner& Form1::pointer()
+{
+    return *m_pointer;
+}
+
+void Form1::buildLayout()
+{
+    setObjectName(u"Form1"_s);
+    setFixedSize(twipsToPixels(8040), twipsToPixels(10185));
+    setFont(arialBold(9));
+    QPalette white = palette();
+    white.setColor(QPalette::Window, Qt::white);
+    setPalette(white);
+    setAutoFillBackground(true);
+
+    PushButton8 = button(this, u"PushButton8"_s, u"Help"_s, twipsRect(120, 120, 7800, 405));
+
+    Frame4 = frame(this, u"Frame4"_s, u"Generate Options"_s, twipsRect(120, 600, 7800, 1850));
+    Option9 = option(Frame4, u"Option9"_s,
+                     u"Orvell's List - Generate random names from my list of names"_s,
+                     twipsRect(240, 300, 6300, 255));
+    Frame1 = frame(Frame4, u"Frame1"_s, u"Gender Options (Orvell's List)"_s,
+                   twipsRect(600, 570, 4320, 735));
+    Option1 = option(Frame1, u"Option1"_s, u"Both"_s, twipsRect(240, 300, 1020, 255));
+    Option2 = option(Frame1, u"Option2"_s, u"Male Only"_s, twipsRect(1260, 300, 1335, 255));
+    Option3 = option(Frame1, u"Option3"_s, u"Female Only"_s, twipsRect(2610, 300, 1455, 255));
+    Option8 = option(Frame4, u"Option8"_s,
+                     u"User List - Generate random names from your list of names"_s,
+                     twipsRect(225, 1440, 6015, 255));
+    // Explicit groups: Qt's automatic grouping would reach into Frame1 and
+    // take the gender options for members of the source group.
+    for (QRadioButton* o : {Option9, Option8})
+        m_sourceGroup->addButton(o);
+    for (QRadioButton* o : {Option1, Option2, Option3})
+        m_genderGroup->addButton(o);
+    Option9->setChecked(true);
+    Option1->setChecked(true);
+
+    Frame3 = frame(this, u"Frame3"_s, u"How many names would you like to generate?"_s,
+                   twipsRect(120, 2505, 7800, 825));
+    Text1 = place<QLineEdit>(Frame3, u"Text1"_s, twipsRect(240, 300, 7305, 375));
+    Text1->setText(u"Text1"_s);
+    Text1->setAccessibleName(Frame3->title());
+
+    Frame6 = frame(this, u"Frame6"_s, u"First Names"_s, twipsRect(120, 3390, 7800, 2775));
+    ListView2 = pane(Frame6, u"ListView2"_s, Frame6->title(), m_lists.firstPane());
+    PushButton2 =
+        button(Frame6, u"PushButton2"_s, u"Add First Name"_s, twipsRect(240, 1695, 3600, 405));
+    PushButton6 = button(Frame6, u"PushButton6"_s, u"Load First Names From File"_s,
+                         twipsRect(3940, 1695, 3600, 405));
+    PushButton4 = button(Frame6, u"PushButton4"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
+
+    Frame5 = frame(this, u"Frame5"_s, u"Last Names"_s, twipsRect(120, 6240, 7800, 2775));
+    ListView1 = pane(Frame5, u"ListView1"_s, Frame5->title(), m_lists.lastPane());
+    PushButton5 =
+        button(Frame5, u"PushButton5"_s, u"Add Last Name"_s, twipsRect(240, 1695, 3600, 400));
+    PushButton7 = button(Frame5, u"PushButton7"_s, u"Load Last Names From File"_s,
+                         twipsRect(3975, 1695, 3600, 405));
+    PushButton3 = button(Frame5, u"PushButton3"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
+
+    PushButton1 =
+        button(this, u"PushButton1"_s, u"Start Generating"_s, twipsRect(120, 9140, 7800, 405));
+    ProgressBar1 = place<QProgressBar>(this, u"ProgressBar1"_s, twipsRect(120, 9660, 7800, 405));
+    ProgressBar1->setRange(0, 100);
+    ProgressBar1->setValue(0);
+    ProgressBar1->setTextVisible(false);
+    ProgressBar1->setAccessibleName(u"Progress"_s);
+
+    // Tab order by the layout's tab indexes; frames take no focus.
+    const QList<QWidget*> tabOrder{Text1,       ListView2,   PushButton2, PushButton6,
+                                   PushButton4, ListView1,   PushButton5, PushButton7,
+                                   PushButton3, PushButton1, PushButton8, Option9,
+                                   Option1,     Option2,     Option3,     Option8};
+    for (qsizetype i = 1; i < tabOrder.size(); ++i)
+        setTabOrder(tabOrder[i - 1], tabOrder[i]);
+    ProgressBar1->setFocusPolicy(Qt::NoFocus);
+
+    // The hover rule: the hand over the buttons, the default pointer over
+    // the window, the frames, the source options and the panes.
+    m_pointer->watch(this, MousePointer::Default);
+    for (QWidget* control : std::initializer_list<QWidget*>{Frame1, Frame3, Frame4, Frame5, Frame6,
+                                                            Option8, Option9, ListView1, ListView2})
+        m_pointer->watch(control, MousePointer::Default);
+    for (QWidget* control : std::initializer_list<QWidget*>{PushButton1, PushButton2, PushButton3,
+                                                            PushButton4, PushButton5, PushButton6,
+                                                            PushButton7, PushButton8})
+        m_pointer->watch(control, MousePointer::Custom);
+}
+
+void Form1::wireHandlers()
+{
+    connect(Text1, &QLineEdit::textChanged, this, &Form1::Text1_Change);
+    Text1->installEventFilter(this);
+
+    // An option's click runs when it becomes selected, by the user or by
+    // the restoring of the stored choice.
+    const auto onSelected = [this](QRadioButton* o, void (Form1::*handler)()) {
+        connect(o, &QRadioButton::toggled, this, [this, handler](bool selected) {
+            if (selected)
+                (this->*handler)();
+        });
+    };
+    onSelected(Option1, &Form1::Option1_Click);
+    onSelected(Option2, &Form1::Option2_Click);
+    onSelected(Option3, &Form1::Option3_Click);
+    onSelected(Option8, &Form1::Option8_Click);
+    onSelected(Option9, &Form1::Option9_Click);
+
+    for (QTreeView* view : {ListView1, ListView2}) {
+        view->installEventFilter(this);
+        connect(view, &QTreeView::doubleClicked, this,
+                [this, view] { ListView_Remove(view, view == ListView1 ? m_lists.lastPane()
+                                                                       : m_lists.firstPane()); });
+    }
+
+    connect(PushButton8, &QPushButton::clicked, this, &Form1::PushButton8_Click);
+}
+
+void Form1::Form_Load()
+{
+    // Skin, centring, hover cursor and the seeding of the random source come
+    // first, then the splash window; the title and icon follow them.
+    setWindowTitle(ApplicationTitle);
+
+    m_lists.firstPane().setHeader(u"First Names"_s);
+    m_lists.lastPane().setHeader(u"Last Names"_s);
+    ListView1->setColumnWidth(0, twipsToPixels(6500));
+    ListView2->setColumnWidth(0, twipsToPixels(6500));
+
+    m_lists.RefreshLists(listChoice());
+
+    const ListChoice stored = restoredListChoice(m_env.settings);
+    restoreOption(Option9, stored.builtIn);
+    restoreOption(Option8, stored.user);
+    restoreOption(Option1, stored.both);
+    restoreOption(Option2, stored.male);
+    restoreOption(Option3, stored.female);
+
+    Text1->setText(m_env.settings.read(u"Text1"_s, u"100"_s));
+    Text1->setFocus();
+    Text1->selectAll();
+}
+
+void Form1::restoreOption(QRadioButton* option, bool selected)
+{
+    if (selected) {
+        // Selecting deselects the rest of the group and runs the click.
+        option->setChecked(true);
+        return;
+    }
+    // A stored choice may leave its group with nothing selected, which an
+    // exclusive group would refuse.
+    QButtonGroup* group = option->group();
+    group->setExclusive(false);
+    option->setChecked(false);
+    group->setExclusive(true);
+}
+
+ListChoice Form1::listChoice() const
+{
+    return {Option9->isChecked(), Option8->isChecked(), Option1->isChecked(),
+            Option2->isChecked(), Option3->isChecked()};
+}
+
+void Form1::closeEvent(QCloseEvent* event)
+{
+    // Form_Unload: closing the main window ends the program. Every setting
+    // was written when it changed, so nothing is saved here.
+    event->accept();
+    QCoreApplication::quit();
+}
+
+bool Form1::eventFilter(QObject* watched, QEvent* event)
+{
+    if (watched == Text1 && event->type() == QEvent::FocusIn)
+        Text1_GotFocus();
+    if (event->type() == QEvent::KeyPress && (watched == ListView1 || watched == ListView2)) {
+        if (static_cast<QKeyEvent*>(event)->key() == Qt::Key_Delete) {
+            auto* view = static_cast<QTreeView*>(watched);
+            ListView_Remove(view, view == ListView1 ? m_lists.lastPane() : m_lists.firstPane());
+            return true;
+        }
+    }
+    return QWidget::eventFilter(watched, event);
+}
+
+void Form1::Text1_Change()
+{
+    m_env.settings.write(u"Text1"_s, Text1->text());
+}
+
+void Form1::Text1_GotFocus()
+{
+    Text1->selectAll();
+}
+
+void Form1::Option1_Click()
+{
+    storeGenderOptions(m_env.settings, listChoice());
+    m_lists.RefreshLists(listChoice());
+}
+
+void Form1::Option2_Click()
+{
+    Option1_Click();
+}
+
+void Form1::Option3_Click()
+{
+    Option1_Click();
+}
+
+void Form1::Option8_Click()
+{
+    const ListChoice choice = listChoice();
+    PushButton4->setText(deleteButtonCaption(choice));
+    PushButton3->setText(deleteButtonCaption(choice));
+    storeSourceOptions(m_env.settings, choice);
+    for (QRadioButton* gender : {Option1, Option2, Option3})
+        gender->setEnabled(false);
+    m_lists.RefreshLists(listChoice());
+}
+
+void Form1::Option9_Click()
+{
+    const ListChoice choice = listChoice();
+    PushButton4->setText(deleteButtonCaption(choice));
+    PushButton3->setText(deleteButtonCaption(choice));
+    storeSourceOptions(m_env.settings, choice);
+    for (QRadioButton* gender : {Option1, Option2, Option3})
+        gender->setEnabled(true);
+    m_lists.RefreshLists(listChoice());
+}
+
+void Form1::ListView_Remove(QTreeView* pane, PaneModel& model)
+{
+    // Pane only: the name is back at the next refresh. Without a selection
+    // there is nothing to remove, and nothing is said.
+    const QModelIndex current = pane->selectionModel()->currentIndex();
+    if (current.isValid() && pane->selectionModel()->isSelected(current))
+        model.removeName(current.row());
+}
+
+void Form1::PushButton8_Click()
+{
+    Trap trap(m_env.dialogs, u"in Tessmark.Form1.PushButton8_Click "_s, ClosingLine::Long);
+    trap(10, [&] { refuse(m_env.dialogs, HelpText); });
+}

@@ -1,0 +1,126 @@
+#include "names/database.h"
+
+#include "app/failure.h"
+
+#include <QDir>
+
+#include <sqlite3.h>
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+// Another program holding the file locked is reported after this long
+// instead of leaving the window hanging.
+constexpr int BusyTimeoutMs = 2000;
+
+// A prepared statement, finalised on every path out.
+class Statement {
+public:
+    Statement(sqlite3* db, const char* sql)
+    {
+        if (sqlite3_prepare_v2(db, sql, -1, &m_stmt, nullptr) != SQLITE_OK)
+            throw Failure(QString::fromUtf8(sqlite3_errmsg(db)));
+    }
+    ~Statement() { sqlite3_finalize(m_stmt); }
+    Statement(const Statement&) = delete;
+    Statement& operator=(const Statement&) = delete;
+
+    sqlite3_stmt* get() const { return m_stmt; }
+
+private:
+    sqlite3_stmt* m_stmt = nullptr;
+};
+
+int columnIndex(sqlite3_stmt* stmt, const char* name)
+{
+    const int count = sqlite3_column_count(stmt);
+    for (int i = 0; i < count; ++i) {
+        if (sqlite3_stricmp(sqlite3_column_name(stmt, i), name) == 0)
+            return i;
+    }
+    throw Failure(u"Item cannot be found in the collection corresponding to the requested "
+                  "name or ordinal: %1"_s.arg(QString::fromUtf8(name)));
+}
+
+} // namespace
+
+QString namesDatabasePath(const QString& programFolder)
+{
+    return QDir(programFolder).filePath(u"names.mdb"_s);
+}
+
+Connection::Connection(const QString& path)
+{
+    const QByteArray file = QFile::encodeName(path);
+    const int rc = sqlite3_open_v2(file.constData(), &m_db, SQLITE_OPEN_READWRITE, nullptr);
+    if (rc != SQLITE_OK) {
+        const QString message = m_db ? QString::fromUtf8(sqlite3_errmsg(m_db))
+                                     : QString::fromUtf8(sqlite3_errstr(rc));
+        sqlite3_close(m_db);
+        m_db = nullptr;
+        throw Failure(message);
+    }
+    sqlite3_busy_timeout(m_db, BusyTimeoutMs);
+    sqlite3_extended_result_codes(m_db, 1);
+}
+
+Connection::~Connection()
+{
+    sqlite3_close(m_db);
+}
+
+void Connection::fail() const
+{
+    throw Failure(QString::fromUtf8(sqlite3_errmsg(m_db)));
+}
+
+void Connection::execute(const char* sql)
+{
+    Statement stmt(m_db, sql);
+    if (sqlite3_step(stmt.get()) != SQLITE_DONE)
+        fail();
+}
+
+void Connection::execute(const char* sql, const QString& name)
+{
+    Statement stmt(m_db, sql);
+    const QByteArray utf8 = name.toUtf8();
+    sqlite3_bind_text(stmt.get(), 1, utf8.constData(), int(utf8.size()), SQLITE_STATIC);
+    if (sqlite3_step(stmt.get()) != SQLITE_DONE)
+        fail();
+}
+
+QStringList Connection::queryNames(const Sql::Query& query)
+{
+    Statement stmt(m_db, query.text);
+    const int column = columnIndex(stmt.get(), query.column);
+    QStringList names;
+    int rc;
+    while ((rc = sqlite3_step(stmt.get())) == SQLITE_ROW) {
+        const auto* text = reinterpret_cast<const char*>(sqlite3_column_text(stmt.get(), column));
+        const int bytes = sqlite3_column_bytes(stmt.get(), column);
+        names.append(QString::fromUtf8(text, bytes));
+    }
+    if (rc != SQLITE_DONE)
+        fail();
+    return names;
+}
+
+Connection::Transaction::Transaction(Connection& connection)
+    : m_connection(connection)
+{
+    m_connection.execute("begin immediate");
+}
+
+Connection::Transaction::~Transaction()
+{
+    if (m_open)
+        sqlite3_exec(m_connection.m_db, "commit", nullptr, nullptr, nullptr);
+}
+
+void Connection::Transaction::commit()
+{
+    m_open = false;
+    m_connection.execute("commit");
+}

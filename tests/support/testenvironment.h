@@ -1,0 +1,41 @@
+#pragma once
+
+#include "app/environment.h"
+#include "app/settings.h"
+#include "support/fakedialogs.h"
+
+#include <QStringList>
+#include <QTemporaryDir>
+
+#include <memory>
+
+// Points the settings store at a fresh temporary folder, so no test ever
+// touches the user's settings. Call before the first Settings is made.
+void useTemporarySettings();
+
+// A program folder of its own for one test: a fresh copy of the shipped
+// names database, an empty settings store and scripted dialogs.
+class TestEnvironment {
+    QTemporaryDir m_folder; // first: the environment below points into it
+
+public:
+    // With shippedDatabase false the folder starts without names.mdb.
+    explicit TestEnvironment(bool shippedDatabase = true);
+
+    QString folder() const { return m_folder.path(); }
+    QString databasePath() const;
+    QString filePath(const QString& name) const;
+
+    FakeDialogs dialogs;
+    std::unique_ptr<Settings> settings;
+    Environment environment;
+};
+
+// A names database with the program's tables and no rows.
+void createEmptyDatabase(const QString& path);
+
+// Direct access for checking what the program stored: every value of a
+// table's column in storage order, and a count of its rows.
+QStringList tableColumn(const QString& databasePath, const QString& table, const QString& column);
+void insertRows(const QString& databasePath, const QString& table, const QString& column,
+                const QStringList& values);
