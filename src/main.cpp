@@ -1,7 +1,10 @@
 #include "app/application.h"
+#include "app/clock.h"
 #include "app/environment.h"
 #include "app/qtdialogs.h"
 #include "app/settings.h"
+#include "app/shell.h"
+#include "generate/randomsource.h"
 
 int main(int argc, char** argv)
 {
@@ -9,6 +12,10 @@ int main(int argc, char** argv)
     QtDialogs dialogs;
     app.setDialogs(&dialogs);
     Settings settings;
-    Environment environment{dialogs, settings, QCoreApplication::applicationDirPath()};
+    DesktopShell shell;
+    SystemClock clock;
+    RandomSource random;
+    Environment environment{
+        dialogs, settings, shell, clock, random, QCoreApplication::applicationDirPath()};
     return runProgram(app, environment);
 }

@@ -353,7 +353,11 @@ int main(int argc, char** argv)
         PrintingDialogs dialogs;
         app.setDialogs(&dialogs);
         Settings settings;
-        Environment environment{dialogs, settings, QString::fromLocal8Bit(argv[2])};
+        FakeShell shell;
+        FakeClock clock;
+        RandomSource random;
+        Environment environment{dialogs, settings, shell, clock, random,
+                                QString::fromLocal8Bit(argv[2])};
         return runProgram(app, environment);
     }
     QApplication app(argc, argv);

@@ -2,14 +2,20 @@
 
 #include <QString>
 
+class Clock;
 class Dialogs;
+class RandomSource;
 class Settings;
+class Shell;
 
 // What the windows take from the platform. The program builds it from the
 // real implementations; tests build it from fakes and temporary folders.
 struct Environment {
     Dialogs& dialogs;
     Settings& settings;
+    Shell& shell;
+    Clock& clock;
+    RandomSource& random;
     // The folder the executable was started from: it holds names.mdb and the
     // program's other files.
     QString programFolder;

@@ -43,7 +43,7 @@ void useTemporarySettings()
 
 TestEnvironment::TestEnvironment(bool shippedDatabase)
     : settings((useTemporarySettings(), std::make_unique<Settings>()))
-    , environment{dialogs, *settings, m_folder.path()}
+    , environment{dialogs, *settings, shell, clock, random, m_folder.path()}
 {
     if (shippedDatabase
         && !QFile::copy(QString::fromUtf8(QUILLANE_SHIPPED_DB), databasePath()))

@@ -2,7 +2,9 @@
 
 #include "app/environment.h"
 #include "app/settings.h"
+#include "generate/randomsource.h"
 #include "support/fakedialogs.h"
+#include "support/fakeplatform.h"
 
 #include <QStringList>
 #include <QTemporaryDir>
@@ -14,7 +16,8 @@
 void useTemporarySettings();
 
 // A program folder of its own for one test: a fresh copy of the shipped
-// names database, an empty settings store and scripted dialogs.
+// names database, an empty settings store, scripted dialogs, a fake shell
+// and clock, and a random source with a fixed seed.
 class TestEnvironment {
     QTemporaryDir m_folder; // first: the environment below points into it
 
@@ -27,6 +30,9 @@ public:
     QString filePath(const QString& name) const;
 
     FakeDialogs dialogs;
+    FakeShell shell;
+    FakeClock clock;
+    RandomSource random;
     std::unique_ptr<Settings> settings;
     Environment environment;
 };
