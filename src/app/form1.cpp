@@ -32,6 +32,18 @@ const QString HelpText =
     "2. You can generate using your User List. In this case, names can be loaded from a text "
     "file or added one at a time."_s;
 
+// The window, its frames and option buttons start white; a skin turns them
+// to the button face.
+void paintWhite(QWidget* widget)
+{
+    QPalette palette = widget->palette();
+    palette.setColor(QPalette::Window, Qt::white);
+    widget->setPalette(palette);
+    // Buttons fill with the button colour unless told otherwise.
+    widget->setBackgroundRole(QPalette::Window);
+    widget->setAutoFillBackground(true);
+}
+
 template <typename Control>
 Control* place(QWidget* container, const QString& name, QRect geometry)
 {
@@ -57,7 +69,7 @@ QGroupBox* frame(QWidget* container, const QString& name, const QString& caption
     auto* f = place<QGroupBox>(container, name, geometry);
     f->setTitle(caption);
     f->setAccessibleName(caption);
-    f->setAutoFillBackground(true);
+    paintWhite(f);
     return f;
 }
 
@@ -67,7 +79,7 @@ QRadioButton* option(QWidget* container, const QString& name, const QString& cap
     auto* o = place<QRadioButton>(container, name, geometry);
     o->setText(caption);
     o->setAccessibleName(caption);
-    o->setAutoFillBackground(true);
+    paintWhite(o);
     return o;
 }
 
@@ -114,10 +126,7 @@ void Form1::buildLayout()
     setObjectName(u"Form1"_s);
     setFixedSize(twipsToPixels(8040), twipsToPixels(10185));
     setFont(arialBold(9));
-    QPalette white = palette();
-    white.setColor(QPalette::Window, Qt::white);
-    setPalette(white);
-    setAutoFillBackground(true);
+    paintWhite(this);
 
     PushButton8 = button(this, u"PushButton8"_s, u"Help"_s, twipsRect(120, 120, 7800, 405));
 

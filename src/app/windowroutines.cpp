@@ -45,6 +45,7 @@ void SetFormBackColor(QWidget* window)
         QPalette palette = widget->palette();
         palette.setColor(QPalette::Window, palette.color(QPalette::Button));
         widget->setPalette(palette);
+        widget->setBackgroundRole(QPalette::Window);
         widget->setAutoFillBackground(true);
     };
     paintButtonFace(window);
