@@ -193,6 +193,9 @@ void Form1::buildLayout()
                                                             PushButton4, PushButton5, PushButton6,
                                                             PushButton7, PushButton8})
         m_pointer->watch(control, MousePointer::Custom);
+    for (QWidget* control :
+         std::initializer_list<QWidget*>{Option1, Option2, Option3, Text1, ProgressBar1})
+        m_pointer->keepPointerOver(control);
 }
 
 void Form1::wireHandlers()
