@@ -1,10 +1,12 @@
 #include "app/form1.h"
 
 #include "app/dialogs.h"
+#include "app/randomvisit.h"
 #include "app/settings.h"
 #include "app/trap.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
+#include "app/windowroutines.h"
 #include "names/database.h"
 
 #include <QButtonGroup>
@@ -200,6 +202,9 @@ void Form1::buildLayout()
                                                             PushButton4, PushButton5, PushButton6,
                                                             PushButton7, PushButton8})
         m_pointer->watch(control, MousePointer::Custom);
+    for (QWidget* control :
+         std::initializer_list<QWidget*>{Option1, Option2, Option3, Text1, ProgressBar1})
+        m_pointer->keepPointerOver(control);
 }
 
 void Form1::wireHandlers()
@@ -233,8 +238,18 @@ void Form1::wireHandlers()
 
 void Form1::Form_Load()
 {
-    // Skin, centring, hover cursor and the seeding of the random source come
-    // first, then the splash window; the title and icon follow them.
+    ApplySkin(this, m_env.programFolder);
+    CenterForm(this);
+    const QString cursor = cursorFilePath(m_env.programFolder);
+    if (FileExists(cursor)) {
+        // A cursor file that cannot be read leaves the arrow for pointer 99.
+        if (const std::optional<QCursor> hand = loadCursorFile(cursor))
+            m_pointer->setCustomCursor(*hand);
+    }
+    RandomVisit(m_env.random, m_env.clock, m_env.shell);
+
+    // The splash window comes here, before the title and icon.
+
     setWindowTitle(ApplicationTitle);
 
     m_lists.firstPane().setHeader(u"First Names"_s);

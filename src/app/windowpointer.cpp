@@ -36,6 +36,11 @@ void WindowPointer::watch(QWidget* control, int pointer)
     target->installEventFilter(this);
 }
 
+void WindowPointer::keepPointerOver(QWidget* control)
+{
+    control->setAttribute(Qt::WA_NoMousePropagation);
+}
+
 void WindowPointer::setMousePointer(int pointer)
 {
     m_pointer = pointer;

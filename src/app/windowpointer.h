@@ -25,6 +25,11 @@ public:
     // A mouse move over control applies the hover rule with pointer.
     void watch(QWidget* control, int pointer);
 
+    // A control without a hover rule: over it the pointer keeps its last
+    // shape. Its moves must not reach the frame or window behind it either,
+    // whose rule would otherwise apply there.
+    void keepPointerOver(QWidget* control);
+
     int mousePointer() const override { return m_pointer; }
     void setMousePointer(int pointer) override;
 

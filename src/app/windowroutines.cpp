@@ -1,10 +1,14 @@
 #include "app/windowroutines.h"
 
+#include "app/cursorfile.h"
+
 #include <QCheckBox>
 #include <QDir>
+#include <QFile>
 #include <QFileInfo>
 #include <QGroupBox>
 #include <QLabel>
+#include <QPixmap>
 #include <QRadioButton>
 #include <QScreen>
 #include <QWidget>
@@ -56,6 +60,29 @@ void SetFormBackColor(QWidget* window)
     }
 }
 
+QString skinFilePath(const QString& programFolder)
+{
+    return QDir(programFolder).filePath(u"x/o.cjs"_s);
+}
+
+bool ApplySkin(QWidget* form, const QString& programFolder)
+{
+    const QString path = skinFilePath(programFolder);
+    const QFileInfo info(path);
+    if (!info.isFile() || !info.isReadable() || info.isHidden())
+        return false;
+    QFile file(path);
+    if (!file.open(QIODevice::ReadOnly))
+        return false;
+    const QString styleSheet = QString::fromUtf8(file.readAll());
+    if (file.error() != QFileDevice::NoError)
+        return false;
+
+    SetFormBackColor(form);
+    form->setStyleSheet(styleSheet);
+    return true;
+}
+
 QString cursorFilePath(const QString& programFolder)
 {
     return QDir(programFolder).filePath(u"HAND-M.CUR"_s);
@@ -63,6 +90,13 @@ QString cursorFilePath(const QString& programFolder)
 
 std::optional<QCursor> loadCursorFile(const QString& path)
 {
-    Q_UNUSED(path);
-    return std::nullopt;
+    // A cursor is a few kilobytes; anything far larger is not one.
+    constexpr qint64 MaxCursorFileSize = 1 << 20;
+    QFile file(path);
+    if (!file.open(QIODevice::ReadOnly) || file.size() > MaxCursorFileSize)
+        return std::nullopt;
+    const std::optional<CursorPicture> picture = readCursorFile(file.readAll());
+    if (!picture)
+        return std::nullopt;
+    return QCursor(QPixmap::fromImage(picture->image), picture->hotSpot.x(), picture->hotSpot.y());
 }

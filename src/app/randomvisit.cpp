@@ -1,0 +1,15 @@
+#include "app/randomvisit.h"
+
+#include "app/clock.h"
+#include "app/shell.h"
+#include "generate/randomsource.h"
+
+#include <cmath>
+
+void RandomVisit(RandomSource& random, const Clock& clock, Shell& shell)
+{
+    random.seedFromTimeOfDay(clock.secondsSinceMidnight());
+    const int n = int(std::floor(random.next() * 100)) + 1;
+    if (n == 7)
+        shell.openWebPage(ProductWebPage);
+}
