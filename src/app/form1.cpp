@@ -7,7 +7,9 @@
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
+#include "generate/generation.h"
 #include "names/database.h"
+#include "results/form2.h"
 
 #include <QButtonGroup>
 #include <QCloseEvent>
@@ -16,6 +18,7 @@
 #include <QHeaderView>
 #include <QKeyEvent>
 #include <QLineEdit>
+#include <QLocale>
 #include <QProgressBar>
 #include <QPushButton>
 #include <QRadioButton>
@@ -233,6 +236,7 @@ void Form1::wireHandlers()
                                                                        : m_lists.firstPane()); });
     }
 
+    connect(PushButton1, &QPushButton::clicked, this, &Form1::PushButton1_Click);
     connect(PushButton8, &QPushButton::clicked, this, &Form1::PushButton8_Click);
 }
 
@@ -375,4 +379,64 @@ void Form1::PushButton8_Click()
 {
     Trap trap(m_env.dialogs, u"in Tessmark.Form1.PushButton8_Click "_s, ClosingLine::Long);
     trap(10, [&] { refuse(m_env.dialogs, HelpText); });
+}
+
+Form2& Form1::form2()
+{
+    // Created on first use and then kept: hiding it keeps its rows and its
+    // output choice.
+    if (!m_form2) {
+        auto window = std::make_unique<Form2>(m_env, *this);
+        window->Form_Load();
+        m_form2 = std::move(window);
+    }
+    return *m_form2;
+}
+
+void Form1::PushButton1_Click()
+{
+    Trap trap(m_env.dialogs, u"in Tessmark.Form1.PushButton1_Click "_s, ClosingLine::Short);
+    // What the user typed or clicked just before counts.
+    trap(10, [] { QCoreApplication::processEvents(); });
+
+    const CountText count(Text1->text(), QLocale::system());
+    bool refused = false;
+    trap(20, [&] {
+        const QString refusal =
+            refusalBeforeStart(count, m_lists.firstPane().count(), m_lists.lastPane().count());
+        if (!refusal.isEmpty()) {
+            refuse(m_env.dialogs, refusal);
+            refused = true;
+        }
+    });
+    if (refused)
+        return;
+
+    // Until the end of the run, whichever way it ends.
+    BusyPointer busy(*m_pointer);
+    trap(60, [&] {
+        if (!count.isNumber()) {
+            refuse(m_env.dialogs, GenerationMessages::NotANumber);
+            refused = true;
+        }
+    });
+    if (refused)
+        return;
+
+    trap(70, [&] { form2().results().clear(); });
+    trap(80, [&] {
+        // The run does not return to the event loop, so the bar is painted
+        // on the spot, and only when the value it shows changes.
+        const auto showProgress = [this](int percent) {
+            ProgressBar1->setValue(percent);
+            ProgressBar1->repaint();
+        };
+        NameGenerator generator(m_lists.firstPane().names(), m_lists.lastPane().names(),
+                                m_env.random);
+        GeneratedNames names = generator.generate(count.count(), showProgress);
+        form2().results().setRows(std::move(names));
+    });
+    trap(90, [&] { ProgressBar1->setValue(0); });
+    trap(100, [&] { form2().show(); });
+    trap(101, [&] { hide(); });
 }

@@ -22,6 +22,9 @@
 
 #include <QWidget>
 
+#include <memory>
+
+class Form2;
 class QButtonGroup;
 class QGroupBox;
 class QLineEdit;
@@ -45,6 +48,8 @@ public:
     ListChoice listChoice() const;
     NameLists& lists() { return m_lists; }
     PointerOwner& pointer();
+    // The results window, once generation has created it; null before.
+    Form2* resultsWindow() const { return m_form2.get(); }
 
 protected:
     void closeEvent(QCloseEvent* event) override;
@@ -63,13 +68,16 @@ private:
     void Option8_Click();
     void Option9_Click();
     void ListView_Remove(QTreeView* pane, PaneModel& model);
+    void PushButton1_Click();
     void PushButton8_Click();
+    Form2& form2();
 
     Environment& m_env;
     WindowPointer* m_pointer;
     QButtonGroup* m_sourceGroup;
     QButtonGroup* m_genderGroup;
     NameLists m_lists;
+    std::unique_ptr<Form2> m_form2;
 
     QPushButton* PushButton1;
     QPushButton* PushButton2;
