@@ -22,6 +22,8 @@
 
 #include <QWidget>
 
+#include <memory>
+
 class QButtonGroup;
 class QGroupBox;
 class QLineEdit;
@@ -29,6 +31,7 @@ class QProgressBar;
 class QPushButton;
 class QRadioButton;
 class QTreeView;
+class Splash;
 class WindowPointer;
 
 class Form1 : public QWidget {
@@ -66,6 +69,8 @@ private:
     void PushButton8_Click();
 
     Environment& m_env;
+    // Hidden after its pause, never destroyed before the main window.
+    std::unique_ptr<Splash> m_splash;
     WindowPointer* m_pointer;
     QButtonGroup* m_sourceGroup;
     QButtonGroup* m_genderGroup;
