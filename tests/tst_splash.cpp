@@ -220,6 +220,8 @@ private Q_SLOTS:
             QCOMPARE(shot.pixel(width - 1, picture.height() / 2), ink);
             QCOMPARE(shot.pixel(4, height - 1), ink);
             QCOMPARE(shot.pixel(width - 2, picture.height() / 2), red);
+            // The box's white background covers the foot of the picture.
+            QCOMPARE(shot.pixel(qMin(box->geometry().right(), width - 2) - 1, box->y() + 2), white);
         };
 
         splash.SplashShow();

@@ -145,12 +145,12 @@ QImage splashPicture() {
         int pixels;
         bool italic;
     } names[] = {
-        {u"Adela Marsh", 250, 34, 17, true},    {u"Tobias Wren", 18, 26, 14, false},
-        {u"Ines Calloway", 330, 70, 13, false}, {u"Rufus Penhale", 120, 58, 12, true},
-        {u"Mira Oakes", 392, 118, 15, true},    {u"Edwin Talbot", 26, 230, 15, true},
-        {u"Sabine Lark", 300, 236, 13, false},  {u"Henry Ashdown", 150, 268, 12, false},
-        {u"Clara Voss", 380, 180, 14, false},   {u"Jonah Fairweather", 312, 282, 13, true},
-        {u"Lena Brook", 10, 150, 12, false},    {u"Oswin Hale", 196, 214, 12, true},
+        {u"Tobias Wren", 16, 26, 14, false},     {u"Adela Marsh", 232, 32, 17, true},
+        {u"Ines Calloway", 372, 60, 13, false},  {u"Rufus Penhale", 112, 58, 12, true},
+        {u"Mira Oakes", 300, 92, 15, true},      {u"Lena Brook", 12, 246, 13, false},
+        {u"Edwin Talbot", 150, 228, 15, true},   {u"Sabine Lark", 330, 224, 13, false},
+        {u"Henry Ashdown", 124, 266, 12, false}, {u"Clara Voss", 270, 256, 14, true},
+        {u"Oswin Hale", 404, 248, 12, true},     {u"Jonah Fairweather", 14, 62, 11, true},
     };
     for (const auto& n : names) {
         QFont font(u"Liberation Serif"_s);

@@ -68,6 +68,8 @@ Splash::Splash(Environment& environment, QWidget* parent)
     Check1->setText(u"Hide this at next startup"_s);
     Check1->setFont(arialBold(9));
     Check1->setPalette(white);
+    // A button fills with the button colour unless told otherwise.
+    Check1->setBackgroundRole(QPalette::Window);
     Check1->setAutoFillBackground(true);
     Check1->setChecked(false);
     Check1->setGeometry(twipsRect(CheckLeftTwips, 0, CheckWidthTwips, CheckHeightTwips));
