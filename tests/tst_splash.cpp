@@ -22,32 +22,37 @@ namespace {
 // Marks a "ShowAgain" that is not in the settings store at all.
 const QString Absent = u"<absent>"_s;
 
-template <typename T> T* control(QWidget& window, const QString& name) {
+template <typename T> T* control(QWidget& window, const QString& name)
+{
     auto* c = window.findChild<T*>(name);
     if (!c)
         qFatal("no control %s", qPrintable(name));
     return c;
 }
 
-void writePicture(const QString& path, QSize size, QColor colour = Qt::red) {
+void writePicture(const QString& path, QSize size, QColor colour = Qt::red)
+{
     QImage picture(size, QImage::Format_RGB32);
     picture.fill(colour);
     if (!picture.save(path, "PNG"))
         qFatal("cannot write %s", qPrintable(path));
 }
 
-void writeText(const QString& path, const QByteArray& text) {
+void writeText(const QString& path, const QByteArray& text)
+{
     QFile file(path);
     if (!file.open(QIODevice::WriteOnly) || file.write(text) != text.size())
         qFatal("cannot write %s", qPrintable(path));
 }
 
-QString splashFolder(const TestEnvironment& env) {
+QString splashFolder(const TestEnvironment& env)
+{
     return env.filePath(u"Splash"_s);
 }
 
 // The folder the splash reads, filled as a row of a table asks.
-void prepareFolder(const TestEnvironment& env, const QString& content) {
+void prepareFolder(const TestEnvironment& env, const QString& content)
+{
     const QDir folder(splashFolder(env));
     if (content == u"missing")
         return;
@@ -72,14 +77,16 @@ public:
     int shown = 0;
 
 protected:
-    bool eventFilter(QObject*, QEvent* event) override {
+    bool eventFilter(QObject*, QEvent* event) override
+    {
         if (event->type() == QEvent::Show)
             ++shown;
         return false;
     }
 };
 
-double expectedPause() {
+double expectedPause()
+{
     return InDevelopment() ? 0.4 : 4.0;
 }
 
@@ -89,7 +96,8 @@ class TestSplash : public QObject {
     Q_OBJECT
 
 private Q_SLOTS:
-    void shownOnlyWhenWantedAndAPictureIsThere_data() {
+    void shownOnlyWhenWantedAndAPictureIsThere_data()
+    {
         QTest::addColumn<QString>("showAgain");
         QTest::addColumn<QString>("folder");
         QTest::addColumn<bool>("shown");
@@ -108,7 +116,8 @@ private Q_SLOTS:
         QTest::newRow("first file is empty") << Absent << u"empty picture"_s << false;
     }
 
-    void shownOnlyWhenWantedAndAPictureIsThere() {
+    void shownOnlyWhenWantedAndAPictureIsThere()
+    {
         QFETCH(QString, showAgain);
         QFETCH(QString, folder);
         QFETCH(bool, shown);
@@ -136,7 +145,8 @@ private Q_SLOTS:
         QVERIFY(env.dialogs.shown.isEmpty());
     }
 
-    void severalPicturesAlwaysTheFirstOfTheListing() {
+    void severalPicturesAlwaysTheFirstOfTheListing()
+    {
         TestEnvironment env;
         const QDir folder(splashFolder(env));
         QDir().mkpath(folder.path());
@@ -160,7 +170,8 @@ private Q_SLOTS:
         }
     }
 
-    void windowFitsThePicture_data() {
+    void windowFitsThePicture_data()
+    {
         QTest::addColumn<QSize>("picture"); // pixels; 15 twips make a pixel
         // 4005 x 3000 twips: the nearest whole pixels to 4000 x 3000.
         QTest::newRow("4005 x 3000 twips") << QSize(267, 200);
@@ -168,7 +179,8 @@ private Q_SLOTS:
         QTest::newRow("narrower than the box") << QSize(120, 40);
     }
 
-    void windowFitsThePicture() {
+    void windowFitsThePicture()
+    {
         QFETCH(QSize, picture);
         TestEnvironment env;
         QDir().mkpath(splashFolder(env));
@@ -229,7 +241,8 @@ private Q_SLOTS:
         QVERIFY(!splash.isVisible());
     }
 
-    void theBoxWritesAtEveryClick_data() {
+    void theBoxWritesAtEveryClick_data()
+    {
         QTest::addColumn<int>("clicks");
         QTest::addColumn<QStringList>("written"); // the stored value after each click
         QTest::addColumn<bool>("shownAtNextStart");
@@ -240,7 +253,8 @@ private Q_SLOTS:
             << 3 << QStringList{u"1"_s, u"0"_s, u"1"_s} << false;
     }
 
-    void theBoxWritesAtEveryClick() {
+    void theBoxWritesAtEveryClick()
+    {
         QFETCH(int, clicks);
         QFETCH(QStringList, written);
         QFETCH(bool, shownAtNextStart);
@@ -273,7 +287,8 @@ private Q_SLOTS:
         QCOMPARE(!env.clock.waits.isEmpty(), shownAtNextStart);
     }
 
-    void pauseEndsOnTime_data() {
+    void pauseEndsOnTime_data()
+    {
         QTest::addColumn<double>("timeOfDay");
         QTest::addColumn<double>("seconds");
         QTest::addColumn<double>("step"); // 0: each wait runs its full time
@@ -286,7 +301,8 @@ private Q_SLOTS:
         QTest::newRow("nothing to wait") << 12 * 3600.0 << 0.0 << 0.0;
     }
 
-    void pauseEndsOnTime() {
+    void pauseEndsOnTime()
+    {
         QFETCH(double, timeOfDay);
         QFETCH(double, seconds);
         QFETCH(double, step);
@@ -310,7 +326,8 @@ private Q_SLOTS:
             QVERIFY(clock.waits.size() <= 2);
     }
 
-    void systemClockLetsEventsRunWhileWaiting() {
+    void systemClockLetsEventsRunWhileWaiting()
+    {
         // Not a measurement of time: only that events go on arriving.
         SystemClock clock;
         bool ran = false;
@@ -321,7 +338,8 @@ private Q_SLOTS:
         QVERIFY(clock.steadySeconds() >= before);
     }
 
-    void startUpGreetsBeforeTheMainWindow() {
+    void startUpGreetsBeforeTheMainWindow()
+    {
         TestEnvironment env;
         prepareFolder(env, u"one picture"_s);
         Form1 form(env.environment);

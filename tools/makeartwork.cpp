@@ -30,7 +30,8 @@ const QColor Gold(0xe8, 0xb8, 0x4a);
 const QColor Paper(0xfb, 0xf8, 0xf1);
 
 // A card of a name list: rounded paper with two ruled name lines.
-void drawCard(QPainter& p, const QRectF& card, double angle, const QColor& paper, bool lines) {
+void drawCard(QPainter& p, const QRectF& card, double angle, const QColor& paper, bool lines)
+{
     p.save();
     p.translate(card.center());
     p.rotate(angle);
@@ -55,7 +56,8 @@ void drawCard(QPainter& p, const QRectF& card, double angle, const QColor& paper
 }
 
 // A quill feather laid across the mark, nib at the lower left.
-void drawQuill(QPainter& p, const QPointF& nib, double length, double angle) {
+void drawQuill(QPainter& p, const QPointF& nib, double length, double angle)
+{
     p.save();
     p.translate(nib);
     p.rotate(angle);
@@ -78,7 +80,8 @@ void drawQuill(QPainter& p, const QPointF& nib, double length, double angle) {
 }
 
 // The mark: a stack of name cards, a "Q" on the front one, a quill over it.
-void drawMark(QPainter& p, const QRectF& box, bool withBackground) {
+void drawMark(QPainter& p, const QRectF& box, bool withBackground)
+{
     const double s = box.width();
     if (withBackground) {
         QLinearGradient back(box.topLeft(), box.bottomRight());
@@ -110,7 +113,8 @@ void drawMark(QPainter& p, const QRectF& box, bool withBackground) {
         drawQuill(p, QPointF(box.left() + s * 0.50, box.top() + s * 0.80), s * 0.52, -58);
 }
 
-QImage icon(int size) {
+QImage icon(int size)
+{
     QImage image(size, size, QImage::Format_ARGB32_Premultiplied);
     image.fill(Qt::transparent);
     QPainter p(&image);
@@ -120,7 +124,8 @@ QImage icon(int size) {
     return image;
 }
 
-QImage splashPicture() {
+QImage splashPicture()
+{
     const int width = 480;
     const int height = 300;
     QImage image(width, height, QImage::Format_RGB32);
@@ -191,7 +196,8 @@ QImage splashPicture() {
     return image;
 }
 
-bool save(const QImage& image, const QString& path) {
+bool save(const QImage& image, const QString& path)
+{
     QSaveFile file(path);
     if (!file.open(QIODevice::WriteOnly) || !image.save(&file, "PNG") || !file.commit()) {
         std::fprintf(stderr, "makeartwork: cannot write %s\n", qPrintable(path));
@@ -202,7 +208,8 @@ bool save(const QImage& image, const QString& path) {
 
 } // namespace
 
-int main(int argc, char** argv) {
+int main(int argc, char** argv)
+{
     // Drawing text needs the font database, which needs a GUI application;
     // no display is needed.
     qputenv("QT_QPA_PLATFORM", "offscreen");

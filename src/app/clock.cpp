@@ -8,16 +8,19 @@
 #include <chrono>
 #include <cmath>
 
-double SystemClock::secondsSinceMidnight() const {
+double SystemClock::secondsSinceMidnight() const
+{
     return QTime::currentTime().msecsSinceStartOfDay() / 1000.0;
 }
 
-double SystemClock::steadySeconds() const {
+double SystemClock::steadySeconds() const
+{
     using namespace std::chrono;
     return duration<double>(steady_clock::now().time_since_epoch()).count();
 }
 
-void SystemClock::waitForEvents(int milliseconds) {
+void SystemClock::waitForEvents(int milliseconds)
+{
     // A nested event loop sleeps in the event dispatcher until something
     // arrives, so a wait costs no processor time; the timer ends it.
     QEventLoop loop;
@@ -29,7 +32,8 @@ void SystemClock::waitForEvents(int milliseconds) {
     loop.exec();
 }
 
-void waitSeconds(Clock& clock, double seconds) {
+void waitSeconds(Clock& clock, double seconds)
+{
     const double start = clock.steadySeconds();
     for (;;) {
         const double left = seconds - (clock.steadySeconds() - start);

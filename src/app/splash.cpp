@@ -33,7 +33,8 @@ constexpr int LineInsetTwips = 10;
 constexpr double PauseSeconds = 4.0;
 constexpr double DevelopmentPauseSeconds = 0.4;
 
-QWidget* line(QWidget* window, const QString& name) {
+QWidget* line(QWidget* window, const QString& name)
+{
     auto* l = new QWidget(window);
     l->setObjectName(name);
     l->setAutoFillBackground(true);
@@ -53,7 +54,8 @@ Splash::Splash(Environment& environment, QWidget* parent)
     , Line1(line(this, u"Line1"_s))
     , Line2(line(this, u"Line2"_s))
     , Line3(line(this, u"Line3"_s))
-    , Line4(line(this, u"Line4"_s)) {
+    , Line4(line(this, u"Line4"_s))
+{
     setObjectName(u"Splash"_s);
     QPalette white = palette();
     white.setColor(QPalette::Window, Qt::white);
@@ -81,7 +83,8 @@ Splash::Splash(Environment& environment, QWidget* parent)
     connect(Check1, &QCheckBox::clicked, this, &Splash::Check1_Click);
 }
 
-void Splash::SplashShow() {
+void Splash::SplashShow()
+{
     if (!splashWanted(m_env.settings))
         return;
     const QString path = splashPicturePath(m_env.programFolder);
@@ -123,28 +126,33 @@ void Splash::SplashShow() {
     hide();
 }
 
-void Splash::Pause(double seconds) {
+void Splash::Pause(double seconds)
+{
     waitSeconds(m_env.clock, seconds);
 }
 
-void Splash::Check1_Click() {
+void Splash::Check1_Click()
+{
     m_env.settings.write(u"ShowAgain"_s, Check1->isChecked() ? u"1"_s : u"0"_s);
 }
 
-void Splash::closeEvent(QCloseEvent* event) {
+void Splash::closeEvent(QCloseEvent* event)
+{
     // The window has no close box; a close asked for from outside (a window
     // manager's key, say) would only cut the greeting short, so it stays
     // for its pause.
     event->ignore();
 }
 
-bool splashWanted(const Settings& settings) {
+bool splashWanted(const Settings& settings)
+{
     bool isNumber = false;
     const double value = settings.read(u"ShowAgain"_s, u"0"_s).trimmed().toDouble(&isNumber);
     return isNumber && value == 0.0;
 }
 
-QString splashPicturePath(const QString& programFolder) {
+QString splashPicturePath(const QString& programFolder)
+{
     const QString folder = QDir(programFolder).filePath(u"Splash"_s);
     // Without QDir::Hidden and QDir::System hidden files and broken links are
     // left out; the iterator keeps the file system's own order.

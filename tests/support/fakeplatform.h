@@ -15,7 +15,8 @@
 class FakeShell : public Shell {
 public:
     void openWebPage(const QUrl& url) override { webPages.append(url); }
-    void openDocument(const QString& path) override {
+    void openDocument(const QString& path) override
+    {
         if (!hasDocumentProgram)
             throw Failure(QStringLiteral("There is no program on this desktop that opens it."));
         documents.append(path);
@@ -34,7 +35,8 @@ class FakeClock : public Clock {
 public:
     double secondsSinceMidnight() const override { return now; }
     double steadySeconds() const override { return steady; }
-    void waitForEvents(int milliseconds) override {
+    void waitForEvents(int milliseconds) override
+    {
         waits.append(milliseconds);
         advance(step > 0 ? step : milliseconds / 1000.0);
         if (duringWait)
@@ -42,7 +44,8 @@ public:
     }
 
     // Moves both clocks on; the time of day starts again at midnight.
-    void advance(double seconds) {
+    void advance(double seconds)
+    {
         steady += seconds;
         now = std::fmod(now + seconds, 86400.0);
     }
