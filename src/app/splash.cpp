@@ -112,7 +112,7 @@ void Splash::SplashShow()
     const int widthTwips = width * TwipsPerPixel;
     Check1->move(Check1->x(), twipsToPixels(heightTwips - CheckHeightTwips - CheckGapTwips));
 
-    // One pixel wide, running past the window, which cuts them at its edge.
+    // One pixel wide, along the whole of each edge, on its outermost pixels.
     const int right = twipsToPixels(widthTwips - LineInsetTwips);
     const int bottom = twipsToPixels(heightTwips - LineInsetTwips);
     Line1->setGeometry(0, 0, 1, height);
