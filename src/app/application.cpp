@@ -4,6 +4,7 @@
 #include "app/environment.h"
 #include "app/failure.h"
 #include "app/form1.h"
+#include "app/programicon.h"
 
 #include <cstdio>
 #include <cstdlib>
@@ -20,6 +21,7 @@ QuillaneApplication::QuillaneApplication(int& argc, char** argv)
     setOrganizationName(u"Varnholt"_s);
     setApplicationName(u"Quillane"_s);
     setApplicationDisplayName(ApplicationTitle);
+    setWindowIcon(programIcon());
 }
 
 bool QuillaneApplication::notify(QObject* receiver, QEvent* event)

@@ -2,7 +2,9 @@
 
 #include "app/dialogs.h"
 #include "app/randomvisit.h"
+#include "app/programicon.h"
 #include "app/settings.h"
+#include "app/splash.h"
 #include "app/trap.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
@@ -252,9 +254,13 @@ void Form1::Form_Load()
     }
     RandomVisit(m_env.random, m_env.clock, m_env.shell);
 
-    // The splash window comes here, before the title and icon.
+    // The splash greets the user before the main window is shown; it waits
+    // out its pause here and stays hidden afterwards.
+    m_splash = std::make_unique<Splash>(m_env);
+    m_splash->SplashShow();
 
     setWindowTitle(ApplicationTitle);
+    setWindowIcon(programIcon());
 
     m_lists.firstPane().setHeader(u"First Names"_s);
     m_lists.lastPane().setHeader(u"Last Names"_s);

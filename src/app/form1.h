@@ -32,6 +32,7 @@ class QProgressBar;
 class QPushButton;
 class QRadioButton;
 class QTreeView;
+class Splash;
 class WindowPointer;
 
 class Form1 : public QWidget {
@@ -73,6 +74,8 @@ private:
     Form2& form2();
 
     Environment& m_env;
+    // Hidden after its pause, never destroyed before the main window.
+    std::unique_ptr<Splash> m_splash;
     WindowPointer* m_pointer;
     QButtonGroup* m_sourceGroup;
     QButtonGroup* m_genderGroup;
