@@ -39,7 +39,7 @@ void ResultsSaver::saveTextFile(const ResultRows& rows) {
         return;
     if (path.isEmpty())
         return;
-    QString text;
+    QByteArray text;
     if (!trap(20, [&] { text = resultsText(rows); }))
         return;
     trap(30, [&] { WriteTextFile(text, path); });

@@ -7,6 +7,7 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QStringEncoder>
 #include <QTemporaryFile>
 
 #include <xlsxwriter.h>
@@ -29,7 +30,7 @@ Failure writerFailure(lxw_error error, const QString& where = {}) {
 
 } // namespace
 
-SpreadsheetCell::SpreadsheetCell(lxw_worksheet* sheet, int row, int column)
+SpreadsheetCell::SpreadsheetCell(Worksheet& sheet, int row, int column)
     : m_sheet(sheet)
     , m_row(row)
     , m_column(column) {}
@@ -37,9 +38,13 @@ SpreadsheetCell::SpreadsheetCell(lxw_worksheet* sheet, int row, int column)
 SpreadsheetCell& SpreadsheetCell::operator=(const QString& text) {
     if (m_row < 1 || m_column < 1)
         throw Failure(u"There is no cell at row %1, column %2"_s.arg(m_row).arg(m_column));
-    const QByteArray utf8 = text.toUtf8();
+    QByteArray& utf8 = m_sheet.m_utf8;
+    QStringEncoder encoder(QStringEncoder::Utf8, QStringEncoder::Flag::Stateless);
+    utf8.resize(encoder.requiredSpace(text.size()) + 1);
+    char* end = encoder.appendToBuffer(utf8.data(), text);
+    *end = '\0';
     const lxw_error error = worksheet_write_string(
-        m_sheet, lxw_row_t(m_row - 1), lxw_col_t(m_column - 1), utf8.constData(), nullptr);
+        m_sheet.m_sheet, lxw_row_t(m_row - 1), lxw_col_t(m_column - 1), utf8.constData(), nullptr);
     if (error != LXW_NO_ERROR)
         throw writerFailure(error, u"cell "_s + cellName(m_row, m_column));
     return *this;
@@ -49,7 +54,7 @@ Worksheet::Worksheet(lxw_worksheet* sheet)
     : m_sheet(sheet) {}
 
 SpreadsheetCell Worksheet::cells(int row, int column) {
-    return SpreadsheetCell(m_sheet, row, column);
+    return SpreadsheetCell(*this, row, column);
 }
 
 Workbook::Workbook(lxw_workbook* book, lxw_worksheet* sheet)

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <QByteArray>
 #include <QString>
 
 #include <memory>
@@ -19,6 +20,7 @@ struct lxw_worksheet;
 // program for spreadsheets, without waiting; the user saves it from there.
 // Every failure throws Failure; nothing half-written stays behind.
 class SpreadsheetApplication;
+class Worksheet;
 
 class SpreadsheetCell {
 public:
@@ -28,9 +30,9 @@ public:
 
 private:
     friend class Worksheet;
-    SpreadsheetCell(lxw_worksheet* sheet, int row, int column);
+    SpreadsheetCell(Worksheet& sheet, int row, int column);
 
-    lxw_worksheet* m_sheet;
+    Worksheet& m_sheet;
     int m_row;
     int m_column;
 };
@@ -41,9 +43,13 @@ public:
 
 private:
     friend class Workbook;
+    friend class SpreadsheetCell;
     explicit Worksheet(lxw_worksheet* sheet);
 
     lxw_worksheet* m_sheet;
+    // One buffer for the UTF-8 of every cell: a million rows make two
+    // million cells, and an array made and freed for each is time.
+    QByteArray m_utf8;
 };
 
 class Workbook {

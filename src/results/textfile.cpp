@@ -5,25 +5,39 @@
 
 #include <QDir>
 #include <QSaveFile>
+#include <QStringEncoder>
+
+#include <algorithm>
 
 using namespace Qt::StringLiterals;
 
-QString resultsText(const ResultRows& rows) {
+QByteArray resultsText(const ResultRows& rows) {
+    // Each name is encoded straight into the end of one buffer: no text of
+    // the whole list is built twice, and no small array is made per name.
+    QStringEncoder encoder(QStringEncoder::System, QStringEncoder::Flag::Stateless);
     const int count = rows.rowCount();
-    QString text;
-    // Typical names are short; a fair guess saves most of the regrowing of
-    // a text that can hold a million lines.
-    text.reserve(qsizetype(count) * 20);
+    QByteArray bytes;
+    bytes.resize(qsizetype(count) * 18);
+    qsizetype used = 0;
     for (int row = 0; row < count; ++row) {
-        text += rows.firstName(row);
-        text += u' ';
-        text += rows.lastName(row);
-        text += u"\r\n";
+        const QString first = rows.firstName(row);
+        const QString last = rows.lastName(row);
+        const qsizetype most = encoder.requiredSpace(first.size() + last.size()) + 3;
+        if (used + most > bytes.size())
+            bytes.resize(std::max(bytes.size() * 2, used + most));
+        char* out = bytes.data() + used;
+        out = encoder.appendToBuffer(out, first);
+        *out++ = ' ';
+        out = encoder.appendToBuffer(out, last);
+        *out++ = '\r';
+        *out++ = '\n';
+        used = out - bytes.constData();
     }
-    return text;
+    bytes.truncate(used);
+    return bytes;
 }
 
-void WriteTextFile(const QString& text, const QString& path) {
+void WriteTextFile(const QByteArray& text, const QString& path) {
     const auto fail = [&path](const QString& reason) {
         return Failure(
             u"The file %1 could not be saved: %2"_s.arg(QDir::toNativeSeparators(path), reason));
@@ -35,8 +49,7 @@ void WriteTextFile(const QString& text, const QString& path) {
     file.setDirectWriteFallback(false);
     if (!file.open(QIODevice::WriteOnly))
         throw fail(file.errorString());
-    const QByteArray bytes = text.toLocal8Bit();
-    if (file.write(bytes) != bytes.size()) {
+    if (file.write(text) != text.size()) {
         const QString reason = file.errorString();
         file.cancelWriting();
         throw fail(reason);
