@@ -6,6 +6,8 @@
 #include "results/spreadsheet.h"
 #include "results/textfile.h"
 
+#include <QStandardPaths>
+
 #include <optional>
 
 using namespace Qt::StringLiterals;

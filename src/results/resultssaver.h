@@ -13,8 +13,8 @@ class Shell;
 // program in a new workbook, with two cells or one cell per row.
 class ResultsSaver {
 public:
-    // cacheFolder: where workbooks are put for the spreadsheet program
-    // (normally the user's cache folder for this program).
+    // cacheFolder: where workbooks are put for the spreadsheet program;
+    // empty means the user's cache folder for this program.
     ResultsSaver(Dialogs& dialogs, Shell& shell, QString cacheFolder);
 
     // The whole work of the button, under its error trap: every failure is
