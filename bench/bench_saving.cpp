@@ -102,15 +102,15 @@ int main(int argc, char** argv) {
     QString document;
     {
         NoShell shell;
-        SpreadsheetApplication excel(shell, dir.path());
-        excel.Workbooks().Add();
-        Worksheet& sheet = excel.ActiveWorkbook().ActiveSheet();
+        SpreadsheetApplication spreadsheet(shell, dir.path());
+        spreadsheet.Workbooks().Add();
+        Worksheet& sheet = spreadsheet.ActiveWorkbook().ActiveSheet();
         for (int row = 0; row < rows.rowCount(); ++row) {
             sheet.cells(row + 1, 1) = rows.firstName(row);
             sheet.cells(row + 1, 2) = rows.lastName(row);
         }
-        excel.setVisible(true);
-        document = excel.documentPath();
+        spreadsheet.setVisible(true);
+        document = spreadsheet.documentPath();
     }
     const double workbookMs = double(timer.nsecsElapsed()) / 1e6;
     const double workbookCpuMs = cpuMs() - workbookCpuStart;

@@ -49,15 +49,15 @@ void ResultsSaver::saveTextFile(const ResultRows& rows) {
 
 void ResultsSaver::saveSpreadsheet(OutputChoice choice, const ResultRows& rows) {
     Trap trap(m_dialogs, Location, ClosingLine::Long);
-    std::optional<SpreadsheetApplication> excel;
-    if (!trap(110, [&] { excel.emplace(m_shell, m_cacheFolder); }))
+    std::optional<SpreadsheetApplication> spreadsheet;
+    if (!trap(110, [&] { spreadsheet.emplace(m_shell, m_cacheFolder); }))
         return;
-    if (!trap(120, [&] { excel->Workbooks().Add(); }))
+    if (!trap(120, [&] { spreadsheet->Workbooks().Add(); }))
         return;
     // The whole fill is one step: a sheet that refuses a cell is reported
     // once, not once for every row after it.
     const bool filled = trap(130, [&] {
-        Worksheet& sheet = excel->ActiveWorkbook().ActiveSheet();
+        Worksheet& sheet = spreadsheet->ActiveWorkbook().ActiveSheet();
         const int count = rows.rowCount();
         for (int row = 0; row < count; ++row) {
             if (choice == OutputChoice::ExcelTwoCells) {
@@ -72,5 +72,5 @@ void ResultsSaver::saveSpreadsheet(OutputChoice choice, const ResultRows& rows) 
     // user would take it for the whole list.
     if (!filled)
         return;
-    trap(140, [&] { excel->setVisible(true); });
+    trap(140, [&] { spreadsheet->setVisible(true); });
 }
