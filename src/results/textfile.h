@@ -1,0 +1,19 @@
+#pragma once
+
+#include <QByteArray>
+#include <QString>
+
+class ResultRows;
+
+// The bytes of a results file: for every row, in list order, the first
+// name, one space, the last name and CR LF, in the system's 8-bit encoding
+// (UTF-8 on a current Linux desktop), without a byte-order mark. The file
+// ends right after the last row's CR LF, so an empty list gives no bytes.
+QByteArray resultsText(const ResultRows& rows);
+
+// Writes text to path, replacing whatever the file held. The text goes to a
+// temporary file beside the target that takes the target's place only once
+// it is complete and on disk: a failure (no write access, a full disk, a
+// path that names a folder) throws Failure with the file system's
+// description and leaves an existing file exactly as it was.
+void WriteTextFile(const QByteArray& text, const QString& path);
