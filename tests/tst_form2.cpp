@@ -5,6 +5,7 @@
 #include "results/form2.h"
 #include "support/testenvironment.h"
 
+#include <QFile>
 #include <QGroupBox>
 #include <QHeaderView>
 #include <QLineEdit>
@@ -280,6 +281,41 @@ private Q_SLOTS:
         QVERIFY(control<QRadioButton>(results, u"Option6"_s)->isChecked());
         QVERIFY(!control<QRadioButton>(results, u"Option4"_s)->isChecked());
         QVERIFY(program.env.dialogs.shown.isEmpty());
+    }
+
+    void savingFollowsTheChosenOutput_data()
+    {
+        QTest::addColumn<QString>("option");
+        QTest::addColumn<bool>("textFile");
+        QTest::newRow("Text File") << u"Option4"_s << true;
+        QTest::newRow("Excel (2 cells)") << u"Option5"_s << false;
+        QTest::newRow("Excel (1 cell)") << u"Option6"_s << false;
+    }
+
+    void savingFollowsTheChosenOutput()
+    {
+        QFETCH(QString, option);
+        QFETCH(bool, textFile);
+        Program program({u"ann"_s}, {u"LEE"_s});
+        program.generate(u"2"_s);
+        Form2& results = *program.results();
+        control<QRadioButton>(results, option)->click();
+        const QString path = program.env.filePath(u"names.txt"_s);
+        program.env.dialogs.answerSave(path);
+
+        control<QPushButton>(results, u"PushButton2"_s)->click();
+
+        if (textFile) {
+            QFile file(path);
+            QVERIFY(file.open(QIODevice::ReadOnly));
+            QCOMPARE(file.readAll(), QByteArray("Ann Lee\r\nAnn Lee\r\n"));
+            QVERIFY(program.env.shell.documents.isEmpty());
+        } else {
+            QVERIFY(!QFile::exists(path));
+            QCOMPARE(program.env.shell.documents.size(), 1);
+            QVERIFY(program.env.shell.documents[0].endsWith(u".xlsx"_s));
+        }
+        QVERIFY(program.env.dialogs.messages().isEmpty());
     }
 
     void columnsAreAddedOnce()

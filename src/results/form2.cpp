@@ -4,6 +4,7 @@
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
+#include "results/resultssaver.h"
 
 #include <QApplication>
 #include <QCloseEvent>
@@ -162,4 +163,10 @@ void Form2::PushButton8_Click()
     trap(20, [&] { hide(); });
 }
 
-void Form2::PushButton2_Click() {}
+void Form2::PushButton2_Click()
+{
+    const OutputChoice choice = Option5->isChecked()   ? OutputChoice::ExcelTwoCells
+                                : Option6->isChecked() ? OutputChoice::ExcelOneCell
+                                                       : OutputChoice::TextFile;
+    ResultsSaver(m_env.dialogs, m_env.shell, QString()).save(choice, m_results);
+}

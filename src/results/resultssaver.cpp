@@ -22,7 +22,13 @@ const QString ResultsSaver::SaveDialogFilter = u"Text Files (*.txt);;All Files (
 ResultsSaver::ResultsSaver(Dialogs& dialogs, Shell& shell, QString cacheFolder)
     : m_dialogs(dialogs)
     , m_shell(shell)
-    , m_cacheFolder(std::move(cacheFolder)) {}
+    , m_cacheFolder(std::move(cacheFolder))
+{
+    if (m_cacheFolder.isEmpty()) {
+        m_cacheFolder =
+            QStandardPaths::writableLocation(QStandardPaths::GenericCacheLocation) + u"/quillane"_s;
+    }
+}
 
 void ResultsSaver::save(OutputChoice choice, const ResultRows& rows) {
     if (choice == OutputChoice::TextFile)
