@@ -11,7 +11,7 @@
 #include <QPushButton>
 #include <QRadioButton>
 #include <QTest>
-#include <QTreeView>
+#include <QTableView>
 
 using namespace Qt::StringLiterals;
 
@@ -28,7 +28,7 @@ T* control(QWidget& window, const QString& name)
 
 QStringList paneNames(QWidget& window, const QString& name)
 {
-    QAbstractItemModel* model = control<QTreeView>(window, name)->model();
+    QAbstractItemModel* model = control<QTableView>(window, name)->model();
     QStringList names;
     for (int row = 0; row < model->rowCount(); ++row)
         names.append(model->index(row, 0).data().toString());
@@ -37,7 +37,7 @@ QStringList paneNames(QWidget& window, const QString& name)
 
 int paneCount(QWidget& window, const QString& name)
 {
-    return control<QTreeView>(window, name)->model()->rowCount();
+    return control<QTableView>(window, name)->model()->rowCount();
 }
 
 // The counts of the built-in list as shipped.
@@ -235,7 +235,7 @@ private Q_SLOTS:
         form.Form_Load();
         form.show();
         QVERIFY(QTest::qWaitForWindowExposed(&form));
-        auto* pane = control<QTreeView>(form, u"ListView1"_s);
+        auto* pane = control<QTableView>(form, u"ListView1"_s);
         const QString second = paneNames(form, u"ListView1"_s).at(1);
         pane->setCurrentIndex(pane->model()->index(1, 0));
         if (byKey) {
@@ -262,7 +262,7 @@ private Q_SLOTS:
         Form1 form(env.environment);
         form.Form_Load();
         form.show();
-        auto* pane = control<QTreeView>(form, u"ListView2"_s);
+        auto* pane = control<QTableView>(form, u"ListView2"_s);
         pane->clearSelection();
         const int before = paneCount(form, u"ListView2"_s);
         QTest::keyClick(pane, Qt::Key_Delete);

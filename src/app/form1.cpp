@@ -6,6 +6,7 @@
 #include "app/settings.h"
 #include "app/splash.h"
 #include "app/trap.h"
+#include "app/layout.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
@@ -24,7 +25,7 @@
 #include <QProgressBar>
 #include <QPushButton>
 #include <QRadioButton>
-#include <QTreeView>
+#include <QTableView>
 
 using namespace Qt::StringLiterals;
 
@@ -39,71 +40,12 @@ const QString HelpText =
     "2. You can generate using your User List. In this case, names can be loaded from a text "
     "file or added one at a time."_s;
 
-// The window, its frames and option buttons start white; a skin turns them
-// to the button face.
-void paintWhite(QWidget* widget)
+QTableView* pane(QWidget* container, const QString& name, const QString& caption,
+                 PaneModel& model)
 {
-    QPalette palette = widget->palette();
-    palette.setColor(QPalette::Window, Qt::white);
-    widget->setPalette(palette);
-    // Buttons fill with the button colour unless told otherwise.
-    widget->setBackgroundRole(QPalette::Window);
-    widget->setAutoFillBackground(true);
-}
-
-template <typename Control>
-Control* place(QWidget* container, const QString& name, QRect geometry)
-{
-    auto* control = new Control(container);
-    control->setObjectName(name);
-    control->setGeometry(geometry);
-    return control;
-}
-
-QPushButton* button(QWidget* container, const QString& name, const QString& caption,
-                    QRect geometry)
-{
-    auto* b = place<QPushButton>(container, name, geometry);
-    b->setText(caption);
-    b->setAccessibleName(caption);
-    b->setFont(arialBold(11.25));
-    return b;
-}
-
-QGroupBox* frame(QWidget* container, const QString& name, const QString& caption,
-                 QRect geometry)
-{
-    auto* f = place<QGroupBox>(container, name, geometry);
-    f->setTitle(caption);
-    f->setAccessibleName(caption);
-    paintWhite(f);
-    return f;
-}
-
-QRadioButton* option(QWidget* container, const QString& name, const QString& caption,
-                     QRect geometry)
-{
-    auto* o = place<QRadioButton>(container, name, geometry);
-    o->setText(caption);
-    o->setAccessibleName(caption);
-    paintWhite(o);
-    return o;
-}
-
-QTreeView* pane(QWidget* container, const QString& name, const QString& caption,
-                PaneModel& model)
-{
-    auto* view = place<QTreeView>(container, name, twipsRect(240, 300, 7320, 1320));
-    view->setModel(&model);
-    view->setRootIsDecorated(false);
-    view->setUniformRowHeights(true);
-    view->setItemsExpandable(false);
-    view->setEditTriggers(QAbstractItemView::NoEditTriggers);
-    view->setSelectionMode(QAbstractItemView::SingleSelection);
+    QTableView* view = Layout::reportView(container, name, caption,
+                                          twipsRect(240, 300, 7320, 1320), &model);
     view->setToolTip(PaneToolTip);
-    view->setAccessibleName(caption);
-    view->header()->setStretchLastSection(false);
-    view->header()->setSectionsMovable(false);
     return view;
 }
 
@@ -133,20 +75,20 @@ void Form1::buildLayout()
     setObjectName(u"Form1"_s);
     setFixedSize(twipsToPixels(8040), twipsToPixels(10185));
     setFont(arialBold(9));
-    paintWhite(this);
+    Layout::paintWhite(this);
 
-    PushButton8 = button(this, u"PushButton8"_s, u"Help"_s, twipsRect(120, 120, 7800, 405));
+    PushButton8 = Layout::pushButton(this, u"PushButton8"_s, u"Help"_s, twipsRect(120, 120, 7800, 405));
 
-    Frame4 = frame(this, u"Frame4"_s, u"Generate Options"_s, twipsRect(120, 600, 7800, 1850));
-    Option9 = option(Frame4, u"Option9"_s,
+    Frame4 = Layout::frame(this, u"Frame4"_s, u"Generate Options"_s, twipsRect(120, 600, 7800, 1850));
+    Option9 = Layout::optionButton(Frame4, u"Option9"_s,
                      u"Orvell's List - Generate random names from my list of names"_s,
                      twipsRect(240, 300, 6300, 255));
-    Frame1 = frame(Frame4, u"Frame1"_s, u"Gender Options (Orvell's List)"_s,
+    Frame1 = Layout::frame(Frame4, u"Frame1"_s, u"Gender Options (Orvell's List)"_s,
                    twipsRect(600, 570, 4320, 735));
-    Option1 = option(Frame1, u"Option1"_s, u"Both"_s, twipsRect(240, 300, 1020, 255));
-    Option2 = option(Frame1, u"Option2"_s, u"Male Only"_s, twipsRect(1260, 300, 1335, 255));
-    Option3 = option(Frame1, u"Option3"_s, u"Female Only"_s, twipsRect(2610, 300, 1455, 255));
-    Option8 = option(Frame4, u"Option8"_s,
+    Option1 = Layout::optionButton(Frame1, u"Option1"_s, u"Both"_s, twipsRect(240, 300, 1020, 255));
+    Option2 = Layout::optionButton(Frame1, u"Option2"_s, u"Male Only"_s, twipsRect(1260, 300, 1335, 255));
+    Option3 = Layout::optionButton(Frame1, u"Option3"_s, u"Female Only"_s, twipsRect(2610, 300, 1455, 255));
+    Option8 = Layout::optionButton(Frame4, u"Option8"_s,
                      u"User List - Generate random names from your list of names"_s,
                      twipsRect(225, 1440, 6015, 255));
     // Explicit groups: Qt's automatic grouping would reach into Frame1 and
@@ -158,31 +100,31 @@ void Form1::buildLayout()
     Option9->setChecked(true);
     Option1->setChecked(true);
 
-    Frame3 = frame(this, u"Frame3"_s, u"How many names would you like to generate?"_s,
+    Frame3 = Layout::frame(this, u"Frame3"_s, u"How many names would you like to generate?"_s,
                    twipsRect(120, 2505, 7800, 825));
-    Text1 = place<QLineEdit>(Frame3, u"Text1"_s, twipsRect(240, 300, 7305, 375));
+    Text1 = Layout::place<QLineEdit>(Frame3, u"Text1"_s, twipsRect(240, 300, 7305, 375));
     Text1->setText(u"Text1"_s);
     Text1->setAccessibleName(Frame3->title());
 
-    Frame6 = frame(this, u"Frame6"_s, u"First Names"_s, twipsRect(120, 3390, 7800, 2775));
+    Frame6 = Layout::frame(this, u"Frame6"_s, u"First Names"_s, twipsRect(120, 3390, 7800, 2775));
     ListView2 = pane(Frame6, u"ListView2"_s, Frame6->title(), m_lists.firstPane());
     PushButton2 =
-        button(Frame6, u"PushButton2"_s, u"Add First Name"_s, twipsRect(240, 1695, 3600, 405));
-    PushButton6 = button(Frame6, u"PushButton6"_s, u"Load First Names From File"_s,
+        Layout::pushButton(Frame6, u"PushButton2"_s, u"Add First Name"_s, twipsRect(240, 1695, 3600, 405));
+    PushButton6 = Layout::pushButton(Frame6, u"PushButton6"_s, u"Load First Names From File"_s,
                          twipsRect(3940, 1695, 3600, 405));
-    PushButton4 = button(Frame6, u"PushButton4"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
+    PushButton4 = Layout::pushButton(Frame6, u"PushButton4"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
 
-    Frame5 = frame(this, u"Frame5"_s, u"Last Names"_s, twipsRect(120, 6240, 7800, 2775));
+    Frame5 = Layout::frame(this, u"Frame5"_s, u"Last Names"_s, twipsRect(120, 6240, 7800, 2775));
     ListView1 = pane(Frame5, u"ListView1"_s, Frame5->title(), m_lists.lastPane());
     PushButton5 =
-        button(Frame5, u"PushButton5"_s, u"Add Last Name"_s, twipsRect(240, 1695, 3600, 400));
-    PushButton7 = button(Frame5, u"PushButton7"_s, u"Load Last Names From File"_s,
+        Layout::pushButton(Frame5, u"PushButton5"_s, u"Add Last Name"_s, twipsRect(240, 1695, 3600, 400));
+    PushButton7 = Layout::pushButton(Frame5, u"PushButton7"_s, u"Load Last Names From File"_s,
                          twipsRect(3975, 1695, 3600, 405));
-    PushButton3 = button(Frame5, u"PushButton3"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
+    PushButton3 = Layout::pushButton(Frame5, u"PushButton3"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
 
     PushButton1 =
-        button(this, u"PushButton1"_s, u"Start Generating"_s, twipsRect(120, 9140, 7800, 405));
-    ProgressBar1 = place<QProgressBar>(this, u"ProgressBar1"_s, twipsRect(120, 9660, 7800, 405));
+        Layout::pushButton(this, u"PushButton1"_s, u"Start Generating"_s, twipsRect(120, 9140, 7800, 405));
+    ProgressBar1 = Layout::place<QProgressBar>(this, u"ProgressBar1"_s, twipsRect(120, 9660, 7800, 405));
     ProgressBar1->setRange(0, 100);
     ProgressBar1->setValue(0);
     ProgressBar1->setTextVisible(false);
@@ -231,9 +173,9 @@ void Form1::wireHandlers()
     onSelected(Option8, &Form1::Option8_Click);
     onSelected(Option9, &Form1::Option9_Click);
 
-    for (QTreeView* view : {ListView1, ListView2}) {
+    for (QTableView* view : {ListView1, ListView2}) {
         view->installEventFilter(this);
-        connect(view, &QTreeView::doubleClicked, this,
+        connect(view, &QTableView::doubleClicked, this,
                 [this, view] { ListView_Remove(view, view == ListView1 ? m_lists.lastPane()
                                                                        : m_lists.firstPane()); });
     }
@@ -316,7 +258,7 @@ bool Form1::eventFilter(QObject* watched, QEvent* event)
         Text1_GotFocus();
     if (event->type() == QEvent::KeyPress && (watched == ListView1 || watched == ListView2)) {
         if (static_cast<QKeyEvent*>(event)->key() == Qt::Key_Delete) {
-            auto* view = static_cast<QTreeView*>(watched);
+            auto* view = static_cast<QTableView*>(watched);
             ListView_Remove(view, view == ListView1 ? m_lists.lastPane() : m_lists.firstPane());
             return true;
         }
@@ -372,7 +314,7 @@ void Form1::Option9_Click()
     m_lists.RefreshLists(listChoice());
 }
 
-void Form1::ListView_Remove(QTreeView* pane, PaneModel& model)
+void Form1::ListView_Remove(QTableView* pane, PaneModel& model)
 {
     // Pane only: the name is back at the next refresh. Without a selection
     // there is nothing to remove, and nothing is said.

@@ -31,7 +31,7 @@ class QLineEdit;
 class QProgressBar;
 class QPushButton;
 class QRadioButton;
-class QTreeView;
+class QTableView;
 class Splash;
 class WindowPointer;
 
@@ -68,7 +68,7 @@ private:
     void Option3_Click();
     void Option8_Click();
     void Option9_Click();
-    void ListView_Remove(QTreeView* pane, PaneModel& model);
+    void ListView_Remove(QTableView* pane, PaneModel& model);
     void PushButton1_Click();
     void PushButton8_Click();
     Form2& form2();
@@ -101,7 +101,7 @@ private:
     QRadioButton* Option8;
     QRadioButton* Option9;
     QLineEdit* Text1;
-    QTreeView* ListView1;
-    QTreeView* ListView2;
+    QTableView* ListView1;
+    QTableView* ListView2;
     QProgressBar* ProgressBar1;
 };

@@ -1,6 +1,7 @@
 #include "results/form2.h"
 
 #include "app/trap.h"
+#include "app/layout.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
@@ -15,37 +16,6 @@
 #include <QTableView>
 
 using namespace Qt::StringLiterals;
-
-namespace {
-
-template <typename Control> Control* place(QWidget* container, const QString& name, QRect geometry)
-{
-    auto* control = new Control(container);
-    control->setObjectName(name);
-    control->setGeometry(geometry);
-    return control;
-}
-
-QPushButton* button(QWidget* container, const QString& name, const QString& caption, QRect geometry)
-{
-    auto* b = place<QPushButton>(container, name, geometry);
-    b->setText(caption);
-    b->setAccessibleName(caption);
-    b->setFont(arialBold(11.25));
-    return b;
-}
-
-QRadioButton* option(QWidget* container, const QString& name, const QString& caption,
-                     QRect geometry)
-{
-    auto* o = place<QRadioButton>(container, name, geometry);
-    o->setText(caption);
-    o->setAccessibleName(caption);
-    o->setAutoFillBackground(true);
-    return o;
-}
-
-} // namespace
 
 Form2::Form2(Environment& environment, QWidget& mainWindow)
     : QWidget(nullptr, Qt::Window | Qt::WindowTitleHint | Qt::WindowSystemMenuHint
@@ -75,47 +45,23 @@ void Form2::buildLayout()
     if (!QApplication::windowIcon().isNull())
         setWindowIcon(QApplication::windowIcon());
     // White until the loading steps give the window its button face.
-    QPalette white = palette();
-    white.setColor(QPalette::Window, Qt::white);
-    setPalette(white);
-    setAutoFillBackground(true);
+    Layout::paintWhite(this);
 
-    // A table view dressed as a report view: a tree view keeps a 40-byte
-    // record per row, a table's row header 8 bytes, which is what lets a
-    // million rows fit.
-    ListView1 = place<QTableView>(this, u"ListView1"_s, twipsRect(120, 120, 6360, 5040));
-    ListView1->setModel(&m_results);
-    ListView1->setShowGrid(false);
-    ListView1->setWordWrap(false);
-    ListView1->setCornerButtonEnabled(false);
-    ListView1->verticalHeader()->hide();
-    ListView1->verticalHeader()->setSectionResizeMode(QHeaderView::Fixed);
-    ListView1->verticalHeader()->setDefaultSectionSize(ListView1->fontMetrics().height() + 4);
-    ListView1->horizontalHeader()->setDefaultAlignment(Qt::AlignLeft | Qt::AlignVCenter);
-    ListView1->horizontalHeader()->setHighlightSections(false);
-    ListView1->horizontalHeader()->setStretchLastSection(false);
-    ListView1->horizontalHeader()->setSectionsMovable(false);
-    ListView1->horizontalHeader()->setSectionsClickable(false);
-    ListView1->setSelectionMode(QAbstractItemView::SingleSelection);
-    ListView1->setSelectionBehavior(QAbstractItemView::SelectRows);
+    ListView1 = Layout::reportView(this, u"ListView1"_s, u"Results"_s,
+                                   twipsRect(120, 120, 6360, 5040), &m_results);
     // A first name may be retyped in place, as in a report view's label edit.
     ListView1->setEditTriggers(QAbstractItemView::SelectedClicked
                                | QAbstractItemView::EditKeyPressed);
-    ListView1->setSortingEnabled(false);
-    ListView1->setAccessibleName(u"Results"_s);
 
-    Frame2 = place<QGroupBox>(this, u"Frame2"_s, twipsRect(120, 5250, 6360, 690));
-    Frame2->setTitle(u"Output"_s);
-    Frame2->setAccessibleName(Frame2->title());
-    Frame2->setAutoFillBackground(true);
-    Option6 = option(Frame2, u"Option6"_s, u"Excel (1 cell)"_s, twipsRect(3555, 240, 1695, 375));
-    Option4 = option(Frame2, u"Option4"_s, u"Text File"_s, twipsRect(240, 240, 1335, 375));
-    Option5 = option(Frame2, u"Option5"_s, u"Excel (2 cells)"_s, twipsRect(1575, 240, 1695, 375));
+    Frame2 = Layout::frame(this, u"Frame2"_s, u"Output"_s, twipsRect(120, 5250, 6360, 690));
+    Option6 = Layout::optionButton(Frame2, u"Option6"_s, u"Excel (1 cell)"_s, twipsRect(3555, 240, 1695, 375));
+    Option4 = Layout::optionButton(Frame2, u"Option4"_s, u"Text File"_s, twipsRect(240, 240, 1335, 375));
+    Option5 = Layout::optionButton(Frame2, u"Option5"_s, u"Excel (2 cells)"_s, twipsRect(1575, 240, 1695, 375));
     Option4->setChecked(true);
 
     PushButton2 =
-        button(this, u"PushButton2"_s, u"Start Saving Results"_s, twipsRect(1800, 6070, 4680, 405));
-    PushButton8 = button(this, u"PushButton8"_s, u"< Back"_s, twipsRect(120, 6070, 1560, 405));
+        Layout::pushButton(this, u"PushButton2"_s, u"Start Saving Results"_s, twipsRect(1800, 6070, 4680, 405));
+    PushButton8 = Layout::pushButton(this, u"PushButton8"_s, u"< Back"_s, twipsRect(120, 6070, 1560, 405));
 
     const QList<QWidget*> tabOrder{ListView1, Option6, Option4, Option5, PushButton2, PushButton8};
     for (qsizetype i = 1; i < tabOrder.size(); ++i)
