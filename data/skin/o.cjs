@@ -102,7 +102,7 @@ QLineEdit:focus {
 }
 
 /* The list panes and their column header. */
-QTreeView {
+QTableView {
     qproperty-alternatingRowColors: true;
     background-color: #ffffff;
     alternate-background-color: #f2f6fb;
@@ -111,7 +111,7 @@ QTreeView {
     selection-background-color: #2d69ab;
     selection-color: #ffffff;
 }
-QTreeView:focus {
+QTableView:focus {
     border: 1px solid #2d69ab;
 }
 QHeaderView {

@@ -85,7 +85,7 @@ inline QTableView* reportView(QWidget* container, const QString& name, const QSt
     QHeaderView* rows = view->verticalHeader();
     rows->hide();
     rows->setSectionResizeMode(QHeaderView::Fixed);
-    rows->setDefaultSectionSize(view->fontMetrics().height() + 4);
+    rows->setDefaultSectionSize(view->fontMetrics().height() + 2);
     QHeaderView* columns = view->horizontalHeader();
     columns->setDefaultAlignment(Qt::AlignLeft | Qt::AlignVCenter);
     columns->setHighlightSections(false);
