@@ -8,6 +8,7 @@
 // work to a plain class that tests drive directly:
 //
 //   option clicks, Delete key, double-click --> NameLists (names/)   --> names.mdb
+//   add, delete/clear, load from file       --> ListEditor (names/)  --> names.mdb
 //   "Start Generating"                        --> generation (generate/) --> Form2
 //   every button handler                      --> Trap --> error report on failure
 //
@@ -18,6 +19,7 @@
 #include "app/environment.h"
 #include "app/pointer.h"
 #include "names/listchoice.h"
+#include "names/listeditor.h"
 #include "names/namelists.h"
 
 #include <QWidget>
@@ -63,6 +65,12 @@ private:
     void Option8_Click();
     void Option9_Click();
     void ListView_Remove(QTreeView* pane, PaneModel& model);
+    void PushButton2_Click();
+    void PushButton3_Click();
+    void PushButton4_Click();
+    void PushButton5_Click();
+    void PushButton6_Click();
+    void PushButton7_Click();
     void PushButton8_Click();
 
     Environment& m_env;
@@ -70,6 +78,7 @@ private:
     QButtonGroup* m_sourceGroup;
     QButtonGroup* m_genderGroup;
     NameLists m_lists;
+    ListEditor m_editor;
 
     QPushButton* PushButton1;
     QPushButton* PushButton2;

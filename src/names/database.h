@@ -6,6 +6,7 @@
 #include "names/statements.h"
 
 struct sqlite3;
+struct sqlite3_stmt;
 
 // The path of the names database in the program folder.
 QString namesDatabasePath(const QString& programFolder);
@@ -42,6 +43,21 @@ public:
     private:
         Connection& m_connection;
         bool m_open = true;
+    };
+
+    // One statement prepared once and run many times with a single bound
+    // name each: the bulk import's insert.
+    class Prepared {
+    public:
+        Prepared(Connection& connection, const char* sql);
+        ~Prepared();
+        Prepared(const Prepared&) = delete;
+        Prepared& operator=(const Prepared&) = delete;
+        void run(const QString& name);
+
+    private:
+        Connection& m_connection;
+        sqlite3_stmt* m_stmt = nullptr;
     };
 
     sqlite3* handle() const { return m_db; }
