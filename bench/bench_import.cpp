@@ -35,7 +35,8 @@ public:
     int messages = 0;
 };
 
-void writeNames(const QString& path, int count) {
+void writeNames(const QString& path, int count)
+{
     QFile file(path);
     if (!file.open(QIODevice::WriteOnly))
         std::abort();
@@ -57,11 +58,13 @@ void writeNames(const QString& path, int count) {
     file.write(bytes);
 }
 
-double seconds(const QElapsedTimer& timer) {
+double seconds(const QElapsedTimer& timer)
+{
     return double(timer.nsecsElapsed()) / 1e9;
 }
 
-long maxRssMb() {
+long maxRssMb()
+{
     rusage usage{};
     getrusage(RUSAGE_SELF, &usage);
     return usage.ru_maxrss / 1024;
@@ -69,7 +72,8 @@ long maxRssMb() {
 
 } // namespace
 
-int main(int argc, char** argv) {
+int main(int argc, char** argv)
+{
     QCoreApplication app(argc, argv);
     QTemporaryDir dir;
     const QString db = dir.filePath(u"names.mdb"_s);

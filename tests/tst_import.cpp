@@ -21,18 +21,21 @@ namespace {
 
 const QString ImportLocation = u"in Tessmark.Main.FileToListview "_s;
 
-ListChoice userList() {
+ListChoice userList()
+{
     return {false, true, true, false, false};
 }
 
-QStringList texts(const std::vector<NameSplitter::Name>& names) {
+QStringList texts(const std::vector<NameSplitter::Name>& names)
+{
     QStringList result;
     for (const NameSplitter::Name& name : names)
         result.append(name.text);
     return result;
 }
 
-QString integrity(const QString& path) {
+QString integrity(const QString& path)
+{
     sqlite3* db = nullptr;
     sqlite3_open_v2(QFile::encodeName(path).constData(), &db, SQLITE_OPEN_READONLY, nullptr);
     sqlite3_stmt* stmt = nullptr;
@@ -47,20 +50,25 @@ QString integrity(const QString& path) {
 
 struct Rig {
     explicit Rig(ListChoice initial = userList())
-        : choice(initial) {}
+        : choice(initial)
+    {
+    }
 
-    QString writeFile(const QString& name, const QByteArray& bytes) const {
+    QString writeFile(const QString& name, const QByteArray& bytes) const
+    {
         const QString path = env.filePath(name);
         QFile file(path);
         if (!file.open(QIODevice::WriteOnly) || file.write(bytes) != bytes.size())
             qFatal("cannot write %s", qPrintable(path));
         return path;
     }
-    QStringList firstNames() const {
+    QStringList firstNames() const
+    {
         return tableColumn(env.databasePath(), u"user_firstname"_s, u"firstname"_s);
     }
     // The database is whole and the panes can be read from it.
-    void verifyIntact() {
+    void verifyIntact()
+    {
         QCOMPARE(integrity(env.databasePath()), u"ok"_s);
         lists.RefreshLists(choice);
     }
@@ -78,7 +86,8 @@ class TestImport : public QObject {
     Q_OBJECT
 
 private Q_SLOTS:
-    void splittingIntoNames_data() {
+    void splittingIntoNames_data()
+    {
         QTest::addColumn<QByteArray>("bytes");
         QTest::addColumn<QStringList>("names");
 
@@ -108,7 +117,8 @@ private Q_SLOTS:
         QTest::newRow("empty file") << QByteArray() << QStringList();
     }
 
-    void splittingIntoNames() {
+    void splittingIntoNames()
+    {
         QFETCH(QByteArray, bytes);
         QFETCH(QStringList, names);
         QCOMPARE(texts(NameSplitter::split(bytes)), names);
@@ -122,7 +132,8 @@ private Q_SLOTS:
         QCOMPARE(texts(pieces), names);
     }
 
-    void anOverlongNameKeepsOnlyItsLength() {
+    void anOverlongNameKeepsOnlyItsLength()
+    {
         const QByteArray line(3'000'000, 'x');
         const std::vector<NameSplitter::Name> names =
             NameSplitter::split(QByteArray(line + "\nBo"));
@@ -133,7 +144,8 @@ private Q_SLOTS:
         QVERIFY(!names[1].overlong());
     }
 
-    void importingAFile_data() {
+    void importingAFile_data()
+    {
         QTest::addColumn<QByteArray>("bytes");
         QTest::addColumn<QStringList>("stored");
         QTest::newRow("LF only") << "Cy\nAnn\nBo\n"_ba << QStringList{u"Cy"_s, u"Ann"_s, u"Bo"_s};
@@ -144,7 +156,8 @@ private Q_SLOTS:
             << QStringList{u"Zoë"_s, u"  "_s, u"OBrien"_s};
     }
 
-    void importingAFile() {
+    void importingAFile()
+    {
         QFETCH(QByteArray, bytes);
         QFETCH(QStringList, stored);
         Rig rig;
@@ -167,7 +180,8 @@ private Q_SLOTS:
         rig.verifyIntact();
     }
 
-    void namesGoWhereTheSourceSends_data() {
+    void namesGoWhereTheSourceSends_data()
+    {
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<bool>("lastNames");
         QTest::addColumn<QString>("table");
@@ -185,7 +199,8 @@ private Q_SLOTS:
             << userList() << true << u"user_lastname"_s << u"lastname"_s << true;
     }
 
-    void namesGoWhereTheSourceSends() {
+    void namesGoWhereTheSourceSends()
+    {
         QFETCH(ListChoice, choice);
         QFETCH(bool, lastNames);
         QFETCH(QString, table);
@@ -205,7 +220,8 @@ private Q_SLOTS:
         QVERIFY(rig.env.dialogs.messages().isEmpty());
     }
 
-    void cancelChangesNothing() {
+    void cancelChangesNothing()
+    {
         Rig rig;
         rig.editor.PushButton7_Click();
         QCOMPARE(rig.env.dialogs.shown.size(), 1);
@@ -213,7 +229,8 @@ private Q_SLOTS:
         QCOMPARE(rig.lists.lastPane().count(), 0);
     }
 
-    void severalFilesInTheDialogsOrder() {
+    void severalFilesInTheDialogsOrder()
+    {
         Rig rig;
         const QString a = rig.writeFile(u"a.txt"_s, "Ann\n");
         const QString c = rig.writeFile(u"c.txt"_s, "Cy\n");
@@ -233,7 +250,8 @@ private Q_SLOTS:
         QCOMPARE(rig.pointer.history.count(MousePointer::Hourglass), 2);
     }
 
-    void aPathInTheRootFolderIsUsedAsGiven() {
+    void aPathInTheRootFolderIsUsedAsGiven()
+    {
         QTemporaryFile rootFile(u"/quillane-import-XXXXXX.txt"_s);
         if (!rootFile.open())
             QSKIP("the root folder is not writable here");
@@ -249,7 +267,8 @@ private Q_SLOTS:
         QCOMPARE(rig.env.dialogs.messages(), QStringList{u"File not found"_s});
     }
 
-    void rejectedNamesAreReportedAndTheRestStays() {
+    void rejectedNamesAreReportedAndTheRestStays()
+    {
         Rig rig;
         sqlite3* db = nullptr;
         sqlite3_open(QFile::encodeName(rig.env.databasePath()).constData(), &db);
@@ -269,7 +288,8 @@ private Q_SLOTS:
         rig.verifyIntact();
     }
 
-    void reportsOfOneFileAreBounded() {
+    void reportsOfOneFileAreBounded()
+    {
         Rig rig;
         QByteArray bytes;
         const int overlong = ListEditor::MaxReportsPerFile + 15;
@@ -287,7 +307,8 @@ private Q_SLOTS:
         QCOMPARE(rig.firstNames(), QStringList(overlong, u"Ann"_s));
     }
 
-    void aFileThatIsNotTextHarmsNothing_data() {
+    void aFileThatIsNotTextHarmsNothing_data()
+    {
         QTest::addColumn<QByteArray>("bytes");
         QRandomGenerator random(42);
         QByteArray noise(2 * 1024 * 1024, Qt::Uninitialized);
@@ -301,7 +322,8 @@ private Q_SLOTS:
         QTest::newRow("NULs only") << QByteArray(100000, '\0');
     }
 
-    void aFileThatIsNotTextHarmsNothing() {
+    void aFileThatIsNotTextHarmsNothing()
+    {
         QFETCH(QByteArray, bytes);
         Rig rig;
         rig.env.dialogs.answerOpen({rig.writeFile(u"odd.txt"_s, QByteArray(bytes + "\nAfter\n"))});
@@ -315,7 +337,8 @@ private Q_SLOTS:
         rig.verifyIntact();
     }
 
-    void aLockedDatabaseIsReportedNotWaitedFor() {
+    void aLockedDatabaseIsReportedNotWaitedFor()
+    {
         Rig rig;
         sqlite3* other = nullptr;
         sqlite3_open(QFile::encodeName(rig.env.databasePath()).constData(), &other);
@@ -342,7 +365,8 @@ private Q_SLOTS:
         QCOMPARE(rig.firstNames(), (QStringList{u"Ann"_s, u"Bo"_s}));
     }
 
-    void aMissingDatabaseEndsTheFilesImport() {
+    void aMissingDatabaseEndsTheFilesImport()
+    {
         Rig rig;
         const QString path = rig.writeFile(u"n.txt"_s, "Ann\n");
         QFile::remove(rig.env.databasePath());

@@ -16,11 +16,13 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-ListChoice builtIn(bool both, bool male, bool female) {
+ListChoice builtIn(bool both, bool male, bool female)
+{
     return {true, false, both, male, female};
 }
 
-ListChoice userList() {
+ListChoice userList()
+{
     return {false, true, true, false, false};
 }
 
@@ -35,7 +37,8 @@ const QList<Table> AllTables{{u"system_mfirstname"_s, u"Mfirst"_s},
                              {u"user_firstname"_s, u"firstname"_s},
                              {u"user_lastname"_s, u"lastname"_s}};
 
-Table table(const QString& name) {
+Table table(const QString& name)
+{
     for (const Table& t : AllTables) {
         if (t.name == name)
             return t;
@@ -47,17 +50,22 @@ Table table(const QString& name) {
 // panes for the choice as the window shows them before a click.
 struct Rig {
     explicit Rig(ListChoice initial)
-        : choice(initial) {}
-    void start() {
+        : choice(initial)
+    {
+    }
+    void start()
+    {
         lists.RefreshLists(choice);
         pointer.history.clear();
     }
 
-    QStringList column(const QString& tableName) const {
+    QStringList column(const QString& tableName) const
+    {
         const Table t = table(tableName);
         return tableColumn(env.databasePath(), t.name, t.column);
     }
-    QList<QStringList> snapshot() const {
+    QList<QStringList> snapshot() const
+    {
         QList<QStringList> all;
         for (const Table& t : AllTables)
             all.append(tableColumn(env.databasePath(), t.name, t.column));
@@ -78,7 +86,8 @@ class TestListEditor : public QObject {
     Q_OBJECT
 
 private Q_SLOTS:
-    void addingStoresTheTypedName_data() {
+    void addingStoresTheTypedName_data()
+    {
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<int>("kind");
         QTest::addColumn<QStringList>("replies"); // none: the user cancels
@@ -125,7 +134,8 @@ private Q_SLOTS:
             << u"user_firstname"_s << QStringList() << false;
     }
 
-    void addingStoresTheTypedName() {
+    void addingStoresTheTypedName()
+    {
         QFETCH(ListChoice, choice);
         QFETCH(int, kind);
         QFETCH(QStringList, replies);
@@ -163,7 +173,8 @@ private Q_SLOTS:
             QCOMPARE(pane.names().contains(name), shownInPane);
     }
 
-    void overlongTypedNameIsRefused() {
+    void overlongTypedNameIsRefused()
+    {
         Rig rig(userList());
         rig.start();
         rig.env.dialogs.answerInput(QString(300, u'x'));
@@ -176,7 +187,8 @@ private Q_SLOTS:
         QVERIFY(rig.column(u"user_firstname"_s).isEmpty());
     }
 
-    void deletingFromTheBuiltInList_data() {
+    void deletingFromTheBuiltInList_data()
+    {
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<int>("kind");
         QTest::addColumn<QString>("selected"); // empty: nothing selected
@@ -217,7 +229,8 @@ private Q_SLOTS:
             << QStringList{u"system_lastname"_s} << QList<int>{40};
     }
 
-    void deletingFromTheBuiltInList() {
+    void deletingFromTheBuiltInList()
+    {
         QFETCH(ListChoice, choice);
         QFETCH(int, kind);
         QFETCH(QString, selected);
@@ -265,7 +278,8 @@ private Q_SLOTS:
             QVERIFY(!pane.names().contains(marker));
     }
 
-    void clearingEmptiesOneUserList_data() {
+    void clearingEmptiesOneUserList_data()
+    {
         QTest::addColumn<int>("kind");
         QTest::addColumn<int>("selectedRow");
         QTest::newRow("first names, a name selected") << int(ListKind::FirstNames) << 1;
@@ -274,7 +288,8 @@ private Q_SLOTS:
         QTest::newRow("last names, nothing selected") << int(ListKind::LastNames) << -1;
     }
 
-    void clearingEmptiesOneUserList() {
+    void clearingEmptiesOneUserList()
+    {
         QFETCH(int, kind);
         QFETCH(int, selectedRow);
         Rig rig(userList());
@@ -302,13 +317,15 @@ private Q_SLOTS:
             QCOMPARE(after[t], before[t]);
     }
 
-    void anEmptyPaneDoesNothing_data() {
+    void anEmptyPaneDoesNothing_data()
+    {
         QTest::addColumn<int>("kind");
         QTest::newRow("first names") << int(ListKind::FirstNames);
         QTest::newRow("last names") << int(ListKind::LastNames);
     }
 
-    void anEmptyPaneDoesNothing() {
+    void anEmptyPaneDoesNothing()
+    {
         QFETCH(int, kind);
         Rig rig(userList());
         rig.start();
@@ -321,7 +338,8 @@ private Q_SLOTS:
         QVERIFY(rig.pointer.history.isEmpty());
     }
 
-    void aMissingDatabaseIsReportedAndTheHandlerGoesOn() {
+    void aMissingDatabaseIsReportedAndTheHandlerGoesOn()
+    {
         Rig rig(userList());
         rig.start();
         QFile::remove(rig.env.databasePath());
@@ -339,7 +357,8 @@ private Q_SLOTS:
 
     // The window's buttons reach the editor: a user adds, deletes and clears
     // and sees the panes follow.
-    void theWindowsButtonsEditTheLists() {
+    void theWindowsButtonsEditTheLists()
+    {
         TestEnvironment env;
         Form1 form(env.environment);
         form.Form_Load();

@@ -33,7 +33,8 @@ const QString HelpText =
     "file or added one at a time."_s;
 
 template <typename Control>
-Control* place(QWidget* container, const QString& name, QRect geometry) {
+Control* place(QWidget* container, const QString& name, QRect geometry)
+{
     auto* control = new Control(container);
     control->setObjectName(name);
     control->setGeometry(geometry);
@@ -41,7 +42,8 @@ Control* place(QWidget* container, const QString& name, QRect geometry) {
 }
 
 QPushButton* button(QWidget* container, const QString& name, const QString& caption,
-                    QRect geometry) {
+                    QRect geometry)
+{
     auto* b = place<QPushButton>(container, name, geometry);
     b->setText(caption);
     b->setAccessibleName(caption);
@@ -49,7 +51,9 @@ QPushButton* button(QWidget* container, const QString& name, const QString& capt
     return b;
 }
 
-QGroupBox* frame(QWidget* container, const QString& name, const QString& caption, QRect geometry) {
+QGroupBox* frame(QWidget* container, const QString& name, const QString& caption,
+                 QRect geometry)
+{
     auto* f = place<QGroupBox>(container, name, geometry);
     f->setTitle(caption);
     f->setAccessibleName(caption);
@@ -58,7 +62,8 @@ QGroupBox* frame(QWidget* container, const QString& name, const QString& caption
 }
 
 QRadioButton* option(QWidget* container, const QString& name, const QString& caption,
-                     QRect geometry) {
+                     QRect geometry)
+{
     auto* o = place<QRadioButton>(container, name, geometry);
     o->setText(caption);
     o->setAccessibleName(caption);
@@ -66,7 +71,9 @@ QRadioButton* option(QWidget* container, const QString& name, const QString& cap
     return o;
 }
 
-QTreeView* pane(QWidget* container, const QString& name, const QString& caption, PaneModel& model) {
+QTreeView* pane(QWidget* container, const QString& name, const QString& caption,
+                PaneModel& model)
+{
     auto* view = place<QTreeView>(container, name, twipsRect(240, 300, 7320, 1320));
     view->setModel(&model);
     view->setRootIsDecorated(false);
@@ -82,7 +89,8 @@ QTreeView* pane(QWidget* container, const QString& name, const QString& caption,
 }
 
 // The pane's selected row, or -1 when nothing is selected.
-int selectedRow(const QTreeView* pane) {
+int selectedRow(const QTreeView* pane)
+{
     const QModelIndexList selected = pane->selectionModel()->selectedRows();
     return selected.isEmpty() ? -1 : selected.first().row();
 }
@@ -97,18 +105,21 @@ Form1::Form1(Environment& environment, QWidget* parent)
     , m_genderGroup(new QButtonGroup(this))
     , m_lists(namesDatabasePath(environment.programFolder), *m_pointer)
     , m_editor(environment.dialogs, namesDatabasePath(environment.programFolder), m_lists,
-               *m_pointer, [this] { return listChoice(); }) {
+               *m_pointer, [this] { return listChoice(); })
+{
     buildLayout();
     wireHandlers();
 }
 
 Form1::~Form1() = default;
 
-PointerOwner& Form1::pointer() {
+PointerOwner& Form1::pointer()
+{
     return *m_pointer;
 }
 
-void Form1::buildLayout() {
+void Form1::buildLayout()
+{
     setObjectName(u"Form1"_s);
     setFixedSize(twipsToPixels(8040), twipsToPixels(10185));
     setFont(arialBold(9));
@@ -128,9 +139,9 @@ void Form1::buildLayout() {
     Option1 = option(Frame1, u"Option1"_s, u"Both"_s, twipsRect(240, 300, 1020, 255));
     Option2 = option(Frame1, u"Option2"_s, u"Male Only"_s, twipsRect(1260, 300, 1335, 255));
     Option3 = option(Frame1, u"Option3"_s, u"Female Only"_s, twipsRect(2610, 300, 1455, 255));
-    Option8 =
-        option(Frame4, u"Option8"_s, u"User List - Generate random names from your list of names"_s,
-               twipsRect(225, 1440, 6015, 255));
+    Option8 = option(Frame4, u"Option8"_s,
+                     u"User List - Generate random names from your list of names"_s,
+                     twipsRect(225, 1440, 6015, 255));
     // Explicit groups: Qt's automatic grouping would reach into Frame1 and
     // take the gender options for members of the source group.
     for (QRadioButton* o : {Option9, Option8})
@@ -185,13 +196,14 @@ void Form1::buildLayout() {
     for (QWidget* control : std::initializer_list<QWidget*>{Frame1, Frame3, Frame4, Frame5, Frame6,
                                                             Option8, Option9, ListView1, ListView2})
         m_pointer->watch(control, MousePointer::Default);
-    for (QWidget* control :
-         std::initializer_list<QWidget*>{PushButton1, PushButton2, PushButton3, PushButton4,
-                                         PushButton5, PushButton6, PushButton7, PushButton8})
+    for (QWidget* control : std::initializer_list<QWidget*>{PushButton1, PushButton2, PushButton3,
+                                                            PushButton4, PushButton5, PushButton6,
+                                                            PushButton7, PushButton8})
         m_pointer->watch(control, MousePointer::Custom);
 }
 
-void Form1::wireHandlers() {
+void Form1::wireHandlers()
+{
     connect(Text1, &QLineEdit::textChanged, this, &Form1::Text1_Change);
     Text1->installEventFilter(this);
 
@@ -211,9 +223,9 @@ void Form1::wireHandlers() {
 
     for (QTreeView* view : {ListView1, ListView2}) {
         view->installEventFilter(this);
-        connect(view, &QTreeView::doubleClicked, this, [this, view] {
-            ListView_Remove(view, view == ListView1 ? m_lists.lastPane() : m_lists.firstPane());
-        });
+        connect(view, &QTreeView::doubleClicked, this,
+                [this, view] { ListView_Remove(view, view == ListView1 ? m_lists.lastPane()
+                                                                       : m_lists.firstPane()); });
     }
 
     connect(PushButton2, &QPushButton::clicked, this, &Form1::PushButton2_Click);
@@ -225,7 +237,8 @@ void Form1::wireHandlers() {
     connect(PushButton8, &QPushButton::clicked, this, &Form1::PushButton8_Click);
 }
 
-void Form1::Form_Load() {
+void Form1::Form_Load()
+{
     // Skin, centring, hover cursor and the seeding of the random source come
     // first, then the splash window; the title and icon follow them.
     setWindowTitle(ApplicationTitle);
@@ -249,7 +262,8 @@ void Form1::Form_Load() {
     Text1->selectAll();
 }
 
-void Form1::restoreOption(QRadioButton* option, bool selected) {
+void Form1::restoreOption(QRadioButton* option, bool selected)
+{
     if (selected) {
         // Selecting deselects the rest of the group and runs the click.
         option->setChecked(true);
@@ -263,19 +277,22 @@ void Form1::restoreOption(QRadioButton* option, bool selected) {
     group->setExclusive(true);
 }
 
-ListChoice Form1::listChoice() const {
-    return {Option9->isChecked(), Option8->isChecked(), Option1->isChecked(), Option2->isChecked(),
-            Option3->isChecked()};
+ListChoice Form1::listChoice() const
+{
+    return {Option9->isChecked(), Option8->isChecked(), Option1->isChecked(),
+            Option2->isChecked(), Option3->isChecked()};
 }
 
-void Form1::closeEvent(QCloseEvent* event) {
+void Form1::closeEvent(QCloseEvent* event)
+{
     // Form_Unload: closing the main window ends the program. Every setting
     // was written when it changed, so nothing is saved here.
     event->accept();
     QCoreApplication::quit();
 }
 
-bool Form1::eventFilter(QObject* watched, QEvent* event) {
+bool Form1::eventFilter(QObject* watched, QEvent* event)
+{
     if (watched == Text1 && event->type() == QEvent::FocusIn)
         Text1_GotFocus();
     if (event->type() == QEvent::KeyPress && (watched == ListView1 || watched == ListView2)) {
@@ -288,28 +305,34 @@ bool Form1::eventFilter(QObject* watched, QEvent* event) {
     return QWidget::eventFilter(watched, event);
 }
 
-void Form1::Text1_Change() {
+void Form1::Text1_Change()
+{
     m_env.settings.write(u"Text1"_s, Text1->text());
 }
 
-void Form1::Text1_GotFocus() {
+void Form1::Text1_GotFocus()
+{
     Text1->selectAll();
 }
 
-void Form1::Option1_Click() {
+void Form1::Option1_Click()
+{
     storeGenderOptions(m_env.settings, listChoice());
     m_lists.RefreshLists(listChoice());
 }
 
-void Form1::Option2_Click() {
+void Form1::Option2_Click()
+{
     Option1_Click();
 }
 
-void Form1::Option3_Click() {
+void Form1::Option3_Click()
+{
     Option1_Click();
 }
 
-void Form1::Option8_Click() {
+void Form1::Option8_Click()
+{
     const ListChoice choice = listChoice();
     PushButton4->setText(deleteButtonCaption(choice));
     PushButton3->setText(deleteButtonCaption(choice));
@@ -319,7 +342,8 @@ void Form1::Option8_Click() {
     m_lists.RefreshLists(listChoice());
 }
 
-void Form1::Option9_Click() {
+void Form1::Option9_Click()
+{
     const ListChoice choice = listChoice();
     PushButton4->setText(deleteButtonCaption(choice));
     PushButton3->setText(deleteButtonCaption(choice));
@@ -329,7 +353,8 @@ void Form1::Option9_Click() {
     m_lists.RefreshLists(listChoice());
 }
 
-void Form1::ListView_Remove(QTreeView* pane, PaneModel& model) {
+void Form1::ListView_Remove(QTreeView* pane, PaneModel& model)
+{
     // Pane only: the name is back at the next refresh. Without a selection
     // there is nothing to remove, and nothing is said.
     const QModelIndex current = pane->selectionModel()->currentIndex();
@@ -337,31 +362,38 @@ void Form1::ListView_Remove(QTreeView* pane, PaneModel& model) {
         model.removeName(current.row());
 }
 
-void Form1::PushButton2_Click() {
+void Form1::PushButton2_Click()
+{
     m_editor.PushButton2_Click();
 }
 
-void Form1::PushButton3_Click() {
+void Form1::PushButton3_Click()
+{
     m_editor.PushButton3_Click(selectedRow(ListView1));
 }
 
-void Form1::PushButton4_Click() {
+void Form1::PushButton4_Click()
+{
     m_editor.PushButton4_Click(selectedRow(ListView2));
 }
 
-void Form1::PushButton5_Click() {
+void Form1::PushButton5_Click()
+{
     m_editor.PushButton5_Click();
 }
 
-void Form1::PushButton6_Click() {
+void Form1::PushButton6_Click()
+{
     m_editor.PushButton6_Click();
 }
 
-void Form1::PushButton7_Click() {
+void Form1::PushButton7_Click()
+{
     m_editor.PushButton7_Click();
 }
 
-void Form1::PushButton8_Click() {
+void Form1::PushButton8_Click()
+{
     Trap trap(m_env.dialogs, u"in Tessmark.Form1.PushButton8_Click "_s, ClosingLine::Long);
     trap(10, [&] { refuse(m_env.dialogs, HelpText); });
 }

@@ -17,7 +17,8 @@ constexpr int BusyTimeoutMs = 2000;
 // A prepared statement, finalised on every path out.
 class Statement {
 public:
-    Statement(sqlite3* db, const char* sql) {
+    Statement(sqlite3* db, const char* sql)
+    {
         if (sqlite3_prepare_v2(db, sql, -1, &m_stmt, nullptr) != SQLITE_OK)
             throw Failure(QString::fromUtf8(sqlite3_errmsg(db)));
     }
@@ -31,7 +32,8 @@ private:
     sqlite3_stmt* m_stmt = nullptr;
 };
 
-int columnIndex(sqlite3_stmt* stmt, const char* name) {
+int columnIndex(sqlite3_stmt* stmt, const char* name)
+{
     const int count = sqlite3_column_count(stmt);
     for (int i = 0; i < count; ++i) {
         if (sqlite3_stricmp(sqlite3_column_name(stmt, i), name) == 0)
@@ -43,16 +45,18 @@ int columnIndex(sqlite3_stmt* stmt, const char* name) {
 
 } // namespace
 
-QString namesDatabasePath(const QString& programFolder) {
+QString namesDatabasePath(const QString& programFolder)
+{
     return QDir(programFolder).filePath(u"names.mdb"_s);
 }
 
-Connection::Connection(const QString& path) {
+Connection::Connection(const QString& path)
+{
     const QByteArray file = QFile::encodeName(path);
     const int rc = sqlite3_open_v2(file.constData(), &m_db, SQLITE_OPEN_READWRITE, nullptr);
     if (rc != SQLITE_OK) {
-        const QString message =
-            m_db ? QString::fromUtf8(sqlite3_errmsg(m_db)) : QString::fromUtf8(sqlite3_errstr(rc));
+        const QString message = m_db ? QString::fromUtf8(sqlite3_errmsg(m_db))
+                                     : QString::fromUtf8(sqlite3_errstr(rc));
         sqlite3_close(m_db);
         m_db = nullptr;
         throw Failure(message);
@@ -61,21 +65,25 @@ Connection::Connection(const QString& path) {
     sqlite3_extended_result_codes(m_db, 1);
 }
 
-Connection::~Connection() {
+Connection::~Connection()
+{
     sqlite3_close(m_db);
 }
 
-void Connection::fail() const {
+void Connection::fail() const
+{
     throw Failure(QString::fromUtf8(sqlite3_errmsg(m_db)));
 }
 
-void Connection::execute(const char* sql) {
+void Connection::execute(const char* sql)
+{
     Statement stmt(m_db, sql);
     if (sqlite3_step(stmt.get()) != SQLITE_DONE)
         fail();
 }
 
-void Connection::execute(const char* sql, const QString& name) {
+void Connection::execute(const char* sql, const QString& name)
+{
     Statement stmt(m_db, sql);
     const QByteArray utf8 = name.toUtf8();
     sqlite3_bind_text(stmt.get(), 1, utf8.constData(), int(utf8.size()), SQLITE_STATIC);
@@ -83,7 +91,8 @@ void Connection::execute(const char* sql, const QString& name) {
         fail();
 }
 
-QStringList Connection::queryNames(const Sql::Query& query) {
+QStringList Connection::queryNames(const Sql::Query& query)
+{
     Statement stmt(m_db, query.text);
     const int column = columnIndex(stmt.get(), query.column);
     QStringList names;
@@ -99,31 +108,37 @@ QStringList Connection::queryNames(const Sql::Query& query) {
 }
 
 Connection::Transaction::Transaction(Connection& connection)
-    : m_connection(connection) {
+    : m_connection(connection)
+{
     m_connection.execute("begin immediate");
 }
 
-Connection::Transaction::~Transaction() {
+Connection::Transaction::~Transaction()
+{
     if (m_open)
         sqlite3_exec(m_connection.m_db, "commit", nullptr, nullptr, nullptr);
 }
 
-void Connection::Transaction::commit() {
+void Connection::Transaction::commit()
+{
     m_open = false;
     m_connection.execute("commit");
 }
 
 Connection::Prepared::Prepared(Connection& connection, const char* sql)
-    : m_connection(connection) {
+    : m_connection(connection)
+{
     if (sqlite3_prepare_v2(connection.m_db, sql, -1, &m_stmt, nullptr) != SQLITE_OK)
         connection.fail();
 }
 
-Connection::Prepared::~Prepared() {
+Connection::Prepared::~Prepared()
+{
     sqlite3_finalize(m_stmt);
 }
 
-void Connection::Prepared::run(const QString& name) {
+void Connection::Prepared::run(const QString& name)
+{
     const QByteArray utf8 = name.toUtf8();
     sqlite3_bind_text(m_stmt, 1, utf8.constData(), int(utf8.size()), SQLITE_STATIC);
     const int rc = sqlite3_step(m_stmt);

@@ -27,7 +27,8 @@ constexpr qint64 ReadChunkBytes = 256 * 1024;
 // How much of an overlong name its report quotes.
 constexpr qsizetype QuotedLength = 40;
 
-bool fileExists(const QString& path) {
+bool fileExists(const QString& path)
+{
     if (path.isEmpty() || path.contains(QChar(u'\0')))
         return false;
     return QFileInfo::exists(path);
@@ -36,7 +37,8 @@ bool fileExists(const QString& path) {
 // The insert for the list the source option chooses; none with neither
 // option selected. First names added to the built-in list join its female
 // table, whatever the gender.
-const char* insertStatement(ListKind kind, const ListChoice& choice) {
+const char* insertStatement(ListKind kind, const ListChoice& choice)
+{
     const bool first = kind == ListKind::FirstNames;
     if (choice.builtIn)
         return first ? Sql::InsertBuiltInFirstName : Sql::InsertBuiltInLastName;
@@ -45,13 +47,15 @@ const char* insertStatement(ListKind kind, const ListChoice& choice) {
     return nullptr;
 }
 
-Connection& opened(std::optional<Connection>& connection) {
+Connection& opened(std::optional<Connection>& connection)
+{
     if (!connection)
         throw Failure(u"The names database is not open."_s);
     return *connection;
 }
 
-[[noreturn]] void refuseOverlong(const QString& text) {
+[[noreturn]] void refuseOverlong(const QString& text)
+{
     throw Failure(u"The name \"%1...\" is longer than %2 characters and was not stored."_s.arg(
         text.left(QuotedLength), QString::number(NameSplitter::MaxNameLength)));
 }
@@ -64,36 +68,45 @@ ListEditor::ListEditor(Dialogs& dialogs, QString databasePath, NameLists& lists,
     , m_databasePath(std::move(databasePath))
     , m_lists(lists)
     , m_window(window)
-    , m_choice(std::move(choice)) {}
+    , m_choice(std::move(choice))
+{
+}
 
-void ListEditor::PushButton2_Click() {
+void ListEditor::PushButton2_Click()
+{
     addName(ListKind::FirstNames, u"in Tessmark.Form1.PushButton2_Click "_s,
             u"Input first name: "_s);
 }
 
-void ListEditor::PushButton5_Click() {
+void ListEditor::PushButton5_Click()
+{
     addName(ListKind::LastNames, u"in Tessmark.Form1.PushButton5_Click "_s, u"Input last name: "_s);
 }
 
-void ListEditor::PushButton4_Click(int selectedRow) {
+void ListEditor::PushButton4_Click(int selectedRow)
+{
     deleteNames(ListKind::FirstNames, selectedRow, u"in Tessmark.Form1.PushButton4_Click "_s,
                 ClosingLine::Short);
 }
 
-void ListEditor::PushButton3_Click(int selectedRow) {
+void ListEditor::PushButton3_Click(int selectedRow)
+{
     deleteNames(ListKind::LastNames, selectedRow, u"in Tessmark.Form1.PushButton3_Click "_s,
                 ClosingLine::Long);
 }
 
-void ListEditor::PushButton6_Click() {
+void ListEditor::PushButton6_Click()
+{
     importFiles(ListKind::FirstNames, u"in Tessmark.Form1.PushButton6_Click "_s);
 }
 
-void ListEditor::PushButton7_Click() {
+void ListEditor::PushButton7_Click()
+{
     importFiles(ListKind::LastNames, u"in Tessmark.Form1.PushButton7_Click "_s);
 }
 
-void ListEditor::addName(ListKind kind, const QString& location, const QString& prompt) {
+void ListEditor::addName(ListKind kind, const QString& location, const QString& prompt)
+{
     Trap trap(m_dialogs, location, ClosingLine::Long);
     const ListChoice choice = m_choice();
     // Opening holds no lock on the file, so the connection may wait open
@@ -118,7 +131,8 @@ void ListEditor::addName(ListKind kind, const QString& location, const QString& 
 }
 
 void ListEditor::deleteNames(ListKind kind, int selectedRow, const QString& location,
-                             ClosingLine closing) {
+                             ClosingLine closing)
+{
     Trap trap(m_dialogs, location, closing);
     const PaneModel& pane = kind == ListKind::FirstNames ? m_lists.firstPane() : m_lists.lastPane();
     if (pane.count() == 0)
@@ -157,7 +171,8 @@ void ListEditor::deleteNames(ListKind kind, int selectedRow, const QString& loca
     trap(70, [&] { m_lists.RefreshLists(choice); });
 }
 
-void ListEditor::importFiles(ListKind kind, const QString& location) {
+void ListEditor::importFiles(ListKind kind, const QString& location)
+{
     Trap trap(m_dialogs, location, ClosingLine::Long);
     QStringList paths;
     trap(10, [&] { paths = m_dialogs.openFileNames(OpenTitle, OpenFilter); });
@@ -174,7 +189,8 @@ void ListEditor::importFiles(ListKind kind, const QString& location) {
     trap(30, [&] { m_lists.RefreshLists(m_choice()); });
 }
 
-void ListEditor::FileToListview(const QString& path, ListKind kind) {
+void ListEditor::FileToListview(const QString& path, ListKind kind)
+{
     Trap trap(m_dialogs, u"in Tessmark.Main.FileToListview "_s, ClosingLine::Long);
     if (!fileExists(path)) {
         refuse(m_dialogs, u"File not found"_s);

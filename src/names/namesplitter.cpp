@@ -8,7 +8,8 @@ constexpr qsizetype EncodingProbe = 4;
 // How many bytes at the end of a UTF-8 text start a character that the
 // next bytes complete: a lead byte followed by fewer continuation bytes than
 // it announces. Bytes that can start no character are not held back.
-qsizetype incompleteTail(QByteArrayView bytes) {
+qsizetype incompleteTail(QByteArrayView bytes)
+{
     const qsizetype size = bytes.size();
     for (qsizetype back = 1; back <= 3 && back <= size; ++back) {
         const auto byte = static_cast<unsigned char>(bytes[size - back]);
@@ -25,7 +26,8 @@ qsizetype incompleteTail(QByteArrayView bytes) {
 
 } // namespace
 
-void NameSplitter::chooseEncoding() {
+void NameSplitter::chooseEncoding()
+{
     QStringConverter::Encoding encoding = QStringConverter::System;
     if (const auto marked = QStringConverter::encodingForData(m_head))
         encoding = *marked;
@@ -38,7 +40,8 @@ void NameSplitter::chooseEncoding() {
                                        : QStringConverter::Flag::ConvertInitialBom);
 }
 
-void NameSplitter::decode(QByteArrayView bytes, std::vector<Name>& names) {
+void NameSplitter::decode(QByteArrayView bytes, std::vector<Name>& names)
+{
     if (!m_utf8) {
         const QString text = m_decoder->decode(bytes);
         scan(text, names);
@@ -59,7 +62,8 @@ void NameSplitter::decode(QByteArrayView bytes, std::vector<Name>& names) {
     scan(text, names);
 }
 
-void NameSplitter::feed(QByteArrayView bytes, std::vector<Name>& names) {
+void NameSplitter::feed(QByteArrayView bytes, std::vector<Name>& names)
+{
     if (!m_decoder) {
         m_head.append(bytes);
         if (m_head.size() < EncodingProbe)
@@ -73,7 +77,8 @@ void NameSplitter::feed(QByteArrayView bytes, std::vector<Name>& names) {
         decode(bytes, names);
 }
 
-void NameSplitter::finish(std::vector<Name>& names) {
+void NameSplitter::finish(std::vector<Name>& names)
+{
     if (!m_decoder) {
         chooseEncoding();
         const QByteArray head = std::exchange(m_head, {});
@@ -87,7 +92,8 @@ void NameSplitter::finish(std::vector<Name>& names) {
     endName(names);
 }
 
-std::vector<NameSplitter::Name> NameSplitter::split(QByteArrayView bytes) {
+std::vector<NameSplitter::Name> NameSplitter::split(QByteArrayView bytes)
+{
     NameSplitter splitter;
     std::vector<Name> names;
     splitter.feed(bytes, names);
@@ -95,7 +101,8 @@ std::vector<NameSplitter::Name> NameSplitter::split(QByteArrayView bytes) {
     return names;
 }
 
-void NameSplitter::scan(QStringView text, std::vector<Name>& names) {
+void NameSplitter::scan(QStringView text, std::vector<Name>& names)
+{
     if (m_atStart && !text.isEmpty()) {
         m_atStart = false;
         if (text.front() == QChar(0xFEFF))
@@ -118,7 +125,8 @@ void NameSplitter::scan(QStringView text, std::vector<Name>& names) {
     }
 }
 
-void NameSplitter::endName(std::vector<Name>& names) {
+void NameSplitter::endName(std::vector<Name>& names)
+{
     if (m_length == 0)
         return;
     names.push_back({std::move(m_current), m_length});
