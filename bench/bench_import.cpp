@@ -63,6 +63,16 @@ double seconds(const QElapsedTimer& timer)
     return double(timer.nsecsElapsed()) / 1e9;
 }
 
+// The processor time this process has used: on a machine shared with other
+// work it says more than the wall clock.
+double cpuSeconds()
+{
+    rusage usage{};
+    getrusage(RUSAGE_SELF, &usage);
+    return double(usage.ru_utime.tv_sec + usage.ru_stime.tv_sec) +
+           double(usage.ru_utime.tv_usec + usage.ru_stime.tv_usec) / 1e6;
+}
+
 long maxRssMb()
 {
     rusage usage{};
@@ -107,15 +117,21 @@ int main(int argc, char** argv)
                 "(%ld MB before)\n",
                 seconds(timer), dialogs.messages, maxRssMb(), before);
     timer.restart();
+    double cpu = cpuSeconds();
     editor.FileToListview(names, ListKind::FirstNames);
     const double import = seconds(timer);
+    const double importCpu = cpuSeconds() - cpu;
     timer.restart();
+    cpu = cpuSeconds();
     lists.RefreshLists(user);
     const double refresh = seconds(timer);
-    std::printf("FileToListview, %d first names into the user list: %.2f s (goal 3 s)\n", Count,
-                import);
-    std::printf("RefreshLists showing them: %lld first names, %.2f s (goal 1.5 s)\n",
-                static_cast<long long>(lists.firstPane().count()), refresh);
+    const double refreshCpu = cpuSeconds() - cpu;
+    std::printf("FileToListview, %d first names into the user list: %.2f s, processor %.2f s "
+                "(goal 3 s)\n",
+                Count, import, importCpu);
+    std::printf("RefreshLists showing them: %lld first names, %.2f s, processor %.2f s (goal "
+                "1.5 s)\n",
+                static_cast<long long>(lists.firstPane().count()), refresh, refreshCpu);
     std::printf("messages shown: %d; peak memory %ld MB\n", dialogs.messages, maxRssMb());
 
     return 0;

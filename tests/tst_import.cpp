@@ -337,6 +337,28 @@ private Q_SLOTS:
         rig.verifyIntact();
     }
 
+    void aLargeFileKeepsTheTablesIndexes()
+    {
+        Rig rig;
+        QByteArray bytes;
+        for (int i = 0; i < 600000; ++i)
+            bytes += QByteArray::number(999999 - i) + "\n";
+        QVERIFY(bytes.size() > 4 * 1024 * 1024);
+        rig.env.dialogs.answerOpen({rig.writeFile(u"big.txt"_s, bytes + "Zed\n")});
+        rig.editor.PushButton6_Click();
+
+        QVERIFY(rig.env.dialogs.messages().isEmpty());
+        const QStringList stored = rig.firstNames();
+        QCOMPARE(stored.size(), 600001);
+        QCOMPARE(stored.first(), u"999999"_s); // in file order
+        QCOMPARE(stored.last(), u"Zed"_s);
+        QCOMPARE(tableColumn(rig.env.databasePath(), u"sqlite_master"_s, u"name"_s)
+                     .contains(u"user_firstname_firstname"_s),
+                 true);
+        QCOMPARE(rig.lists.firstPane().names().first(), u"400000"_s);
+        rig.verifyIntact();
+    }
+
     void aLockedDatabaseIsReportedNotWaitedFor()
     {
         Rig rig;

@@ -150,3 +150,31 @@ void Connection::Prepared::run(const QString& name)
     if (rc != SQLITE_DONE)
         throw Failure(message);
 }
+
+QList<QByteArray> Connection::dropPlainIndexes(const char* table)
+{
+    QList<QByteArray> names;
+    QList<QByteArray> rebuild;
+    {
+        Statement stmt(m_db, "select name, sql from sqlite_master where type = 'index' "
+                             "and tbl_name = ? and sql is not null");
+        sqlite3_bind_text(stmt.get(), 1, table, -1, SQLITE_STATIC);
+        int rc;
+        while ((rc = sqlite3_step(stmt.get())) == SQLITE_ROW) {
+            const QByteArray sql(reinterpret_cast<const char*>(sqlite3_column_text(stmt.get(), 1)));
+            if (sql.trimmed().toLower().startsWith("create unique"))
+                continue; // it decides what may be stored: it stays
+            names.append(
+                QByteArray(reinterpret_cast<const char*>(sqlite3_column_text(stmt.get(), 0))));
+            rebuild.append(sql);
+        }
+        if (rc != SQLITE_DONE)
+            fail();
+    }
+    for (const QByteArray& name : std::as_const(names)) {
+        QByteArray quoted = name;
+        quoted.replace('"', "\"\"");
+        execute(QByteArray("drop index \"" + quoted + "\"").constData());
+    }
+    return rebuild;
+}

@@ -45,6 +45,12 @@ public:
         bool m_open = true;
     };
 
+    // Drops the table's plain (not unique) indexes and returns the
+    // statements that build them again. Inside a transaction, a bulk insert
+    // followed by those statements is much faster than keeping the indexes
+    // up to date name by name, and nobody sees the table without them.
+    QList<QByteArray> dropPlainIndexes(const char* table);
+
     // One statement prepared once and run many times with a single bound
     // name each: the bulk import's insert.
     class Prepared {
