@@ -24,4 +24,5 @@ printf '\x05\xff\xfeA\x00n\x00\r\x00\n\x00' >"$out/corpus/utf16"
 printf "\x02O'Brien\x00\n   \n" >"$out/corpus/odd"
 
 "$out/fuzz_namesplitter" -max_total_time="$seconds" -max_len=4096 -print_final_stats=1 \
+    -artifact_prefix="$out/" \
     "$out/corpus"

@@ -387,6 +387,18 @@ private Q_SLOTS:
         QCOMPARE(rig.firstNames(), (QStringList{u"Ann"_s, u"Bo"_s}));
     }
 
+    void aDeviceIsNotReadWithoutEnd()
+    {
+        Rig rig;
+        rig.env.dialogs.answerOpen({u"/dev/zero"_s});
+        rig.editor.PushButton6_Click();
+        QCOMPARE(rig.env.dialogs.messages(),
+                 QStringList{
+                     errorReportText(u"This is not a file that names can be read from: /dev/zero"_s,
+                                     ImportLocation, 20, ClosingLine::Long)});
+        QVERIFY(rig.firstNames().isEmpty());
+    }
+
     void aMissingDatabaseEndsTheFilesImport()
     {
         Rig rig;

@@ -125,6 +125,12 @@ void Connection::Transaction::commit()
     m_connection.execute("commit");
 }
 
+void Connection::Transaction::rollback()
+{
+    m_open = false;
+    m_connection.execute("rollback");
+}
+
 Connection::Prepared::Prepared(Connection& connection, const char* sql)
     : m_connection(connection)
 {

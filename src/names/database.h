@@ -39,6 +39,8 @@ public:
         Transaction(const Transaction&) = delete;
         Transaction& operator=(const Transaction&) = delete;
         void commit();
+        // Undoes everything since the transaction began; it ends here.
+        void rollback();
 
     private:
         Connection& m_connection;

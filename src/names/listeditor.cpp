@@ -222,6 +222,9 @@ void ListEditor::FileToListview(const QString& path, ListKind kind)
         return;
     QFile file(path);
     if (!trap(20, [&] {
+            // A device or a pipe could be read without end.
+            if (!QFileInfo(path).isFile())
+                throw Failure(u"This is not a file that names can be read from: %1"_s.arg(path));
             if (!file.open(QIODevice::ReadOnly))
                 throw Failure(file.errorString());
         }))
@@ -240,8 +243,17 @@ void ListEditor::FileToListview(const QString& path, ListKind kind)
             if (file.size() >= BulkFileBytes)
                 indexes = connection->dropPlainIndexes(insertTable(sql));
             insert.emplace(*connection, sql);
-        }))
+        })) {
+        // Never commit a half-made start: the indexes must not go missing.
+        if (transaction) {
+            try {
+                transaction->rollback();
+            } catch (...) {
+                // The connection closes next, which undoes it all the same.
+            }
+        }
         return;
+    }
 
     NameSplitter splitter;
     std::vector<NameSplitter::Name> names;
