@@ -49,6 +49,13 @@ QTableView* pane(QWidget* container, const QString& name, const QString& caption
     return view;
 }
 
+// The pane's selected row, or -1 when nothing is selected.
+int selectedRow(const QTableView* pane)
+{
+    const QModelIndexList selected = pane->selectionModel()->selectedRows();
+    return selected.isEmpty() ? -1 : selected.first().row();
+}
+
 } // namespace
 
 Form1::Form1(Environment& environment, QWidget* parent)
@@ -58,6 +65,8 @@ Form1::Form1(Environment& environment, QWidget* parent)
     , m_sourceGroup(new QButtonGroup(this))
     , m_genderGroup(new QButtonGroup(this))
     , m_lists(namesDatabasePath(environment.programFolder), *m_pointer)
+    , m_editor(environment.dialogs, namesDatabasePath(environment.programFolder), m_lists,
+               *m_pointer, [this] { return listChoice(); })
 {
     buildLayout();
     wireHandlers();
@@ -181,6 +190,12 @@ void Form1::wireHandlers()
     }
 
     connect(PushButton1, &QPushButton::clicked, this, &Form1::PushButton1_Click);
+    connect(PushButton2, &QPushButton::clicked, this, &Form1::PushButton2_Click);
+    connect(PushButton3, &QPushButton::clicked, this, &Form1::PushButton3_Click);
+    connect(PushButton4, &QPushButton::clicked, this, &Form1::PushButton4_Click);
+    connect(PushButton5, &QPushButton::clicked, this, &Form1::PushButton5_Click);
+    connect(PushButton6, &QPushButton::clicked, this, &Form1::PushButton6_Click);
+    connect(PushButton7, &QPushButton::clicked, this, &Form1::PushButton7_Click);
     connect(PushButton8, &QPushButton::clicked, this, &Form1::PushButton8_Click);
 }
 
@@ -318,9 +333,37 @@ void Form1::ListView_Remove(QTableView* pane, PaneModel& model)
 {
     // Pane only: the name is back at the next refresh. Without a selection
     // there is nothing to remove, and nothing is said.
-    const QModelIndex current = pane->selectionModel()->currentIndex();
-    if (current.isValid() && pane->selectionModel()->isSelected(current))
-        model.removeName(current.row());
+    model.removeName(selectedRow(pane));
+}
+
+void Form1::PushButton2_Click()
+{
+    m_editor.PushButton2_Click();
+}
+
+void Form1::PushButton3_Click()
+{
+    m_editor.PushButton3_Click(selectedRow(ListView1));
+}
+
+void Form1::PushButton4_Click()
+{
+    m_editor.PushButton4_Click(selectedRow(ListView2));
+}
+
+void Form1::PushButton5_Click()
+{
+    m_editor.PushButton5_Click();
+}
+
+void Form1::PushButton6_Click()
+{
+    m_editor.PushButton6_Click();
+}
+
+void Form1::PushButton7_Click()
+{
+    m_editor.PushButton7_Click();
 }
 
 void Form1::PushButton8_Click()

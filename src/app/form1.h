@@ -8,6 +8,7 @@
 // work to a plain class that tests drive directly:
 //
 //   option clicks, Delete key, double-click --> NameLists (names/)   --> names.mdb
+//   add, delete/clear, load from file       --> ListEditor (names/)  --> names.mdb
 //   "Start Generating"                        --> generation (generate/) --> Form2
 //   every button handler                      --> Trap --> error report on failure
 //
@@ -18,6 +19,7 @@
 #include "app/environment.h"
 #include "app/pointer.h"
 #include "names/listchoice.h"
+#include "names/listeditor.h"
 #include "names/namelists.h"
 
 #include <QWidget>
@@ -70,6 +72,12 @@ private:
     void Option9_Click();
     void ListView_Remove(QTableView* pane, PaneModel& model);
     void PushButton1_Click();
+    void PushButton2_Click();
+    void PushButton3_Click();
+    void PushButton4_Click();
+    void PushButton5_Click();
+    void PushButton6_Click();
+    void PushButton7_Click();
     void PushButton8_Click();
     Form2& form2();
 
@@ -81,6 +89,7 @@ private:
     QButtonGroup* m_genderGroup;
     NameLists m_lists;
     std::unique_ptr<Form2> m_form2;
+    ListEditor m_editor;
 
     QPushButton* PushButton1;
     QPushButton* PushButton2;

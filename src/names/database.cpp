@@ -124,3 +124,63 @@ void Connection::Transaction::commit()
     m_open = false;
     m_connection.execute("commit");
 }
+
+void Connection::Transaction::rollback()
+{
+    m_open = false;
+    m_connection.execute("rollback");
+}
+
+Connection::Prepared::Prepared(Connection& connection, const char* sql)
+    : m_connection(connection)
+{
+    if (sqlite3_prepare_v2(connection.m_db, sql, -1, &m_stmt, nullptr) != SQLITE_OK)
+        connection.fail();
+}
+
+Connection::Prepared::~Prepared()
+{
+    sqlite3_finalize(m_stmt);
+}
+
+void Connection::Prepared::run(const QString& name)
+{
+    const QByteArray utf8 = name.toUtf8();
+    sqlite3_bind_text(m_stmt, 1, utf8.constData(), int(utf8.size()), SQLITE_STATIC);
+    const int rc = sqlite3_step(m_stmt);
+    // The message first: resetting the statement is what lets it run again.
+    const QString message =
+        rc == SQLITE_DONE ? QString() : QString::fromUtf8(sqlite3_errmsg(m_connection.m_db));
+    sqlite3_reset(m_stmt);
+    sqlite3_clear_bindings(m_stmt);
+    if (rc != SQLITE_DONE)
+        throw Failure(message);
+}
+
+QList<QByteArray> Connection::dropPlainIndexes(const char* table)
+{
+    QList<QByteArray> names;
+    QList<QByteArray> rebuild;
+    {
+        Statement stmt(m_db, "select name, sql from sqlite_master where type = 'index' "
+                             "and tbl_name = ? and sql is not null");
+        sqlite3_bind_text(stmt.get(), 1, table, -1, SQLITE_STATIC);
+        int rc;
+        while ((rc = sqlite3_step(stmt.get())) == SQLITE_ROW) {
+            const QByteArray sql(reinterpret_cast<const char*>(sqlite3_column_text(stmt.get(), 1)));
+            if (sql.trimmed().toLower().startsWith("create unique"))
+                continue; // it decides what may be stored: it stays
+            names.append(
+                QByteArray(reinterpret_cast<const char*>(sqlite3_column_text(stmt.get(), 0))));
+            rebuild.append(sql);
+        }
+        if (rc != SQLITE_DONE)
+            fail();
+    }
+    for (const QByteArray& name : std::as_const(names)) {
+        QByteArray quoted = name;
+        quoted.replace('"', "\"\"");
+        execute(QByteArray("drop index \"" + quoted + "\"").constData());
+    }
+    return rebuild;
+}

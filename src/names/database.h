@@ -6,6 +6,7 @@
 #include "names/statements.h"
 
 struct sqlite3;
+struct sqlite3_stmt;
 
 // The path of the names database in the program folder.
 QString namesDatabasePath(const QString& programFolder);
@@ -38,10 +39,33 @@ public:
         Transaction(const Transaction&) = delete;
         Transaction& operator=(const Transaction&) = delete;
         void commit();
+        // Undoes everything since the transaction began; it ends here.
+        void rollback();
 
     private:
         Connection& m_connection;
         bool m_open = true;
+    };
+
+    // Drops the table's plain (not unique) indexes and returns the
+    // statements that build them again. Inside a transaction, a bulk insert
+    // followed by those statements is much faster than keeping the indexes
+    // up to date name by name, and nobody sees the table without them.
+    QList<QByteArray> dropPlainIndexes(const char* table);
+
+    // One statement prepared once and run many times with a single bound
+    // name each: the bulk import's insert.
+    class Prepared {
+    public:
+        Prepared(Connection& connection, const char* sql);
+        ~Prepared();
+        Prepared(const Prepared&) = delete;
+        Prepared& operator=(const Prepared&) = delete;
+        void run(const QString& name);
+
+    private:
+        Connection& m_connection;
+        sqlite3_stmt* m_stmt = nullptr;
     };
 
     sqlite3* handle() const { return m_db; }
