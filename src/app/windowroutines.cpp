@@ -27,22 +27,6 @@ void CenterForm(QWidget* window)
     window->move(int(left), int(top));
 }
 
-bool FileExists(const QString& path)
-{
-    if (path.isEmpty() || path.contains(QChar(u'\0')))
-        return false;
-    return QFileInfo::exists(path);
-}
-
-bool InDevelopment()
-{
-#ifdef NDEBUG
-    return false;
-#else
-    return true;
-#endif
-}
-
 void SetFormBackColor(QWidget* window)
 {
     const auto paintButtonFace = [](QWidget* widget) {

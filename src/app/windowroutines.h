@@ -1,5 +1,7 @@
 #pragma once
 
+#include "app/programfiles.h"
+
 #include <QCursor>
 #include <QString>
 
@@ -11,12 +13,6 @@ class QWidget;
 
 // Places the window's outer frame in the middle of the screen that holds it.
 void CenterForm(QWidget* window);
-
-// True only for a path that exists; an empty or malformed path is false.
-bool FileExists(const QString& path);
-
-// True in a debug build, where pauses are shortened.
-bool InDevelopment();
 
 // Gives the window, and its frames, option buttons, check boxes and labels,
 // the button-face background of the palette.

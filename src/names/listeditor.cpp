@@ -3,6 +3,7 @@
 #include "app/dialogs.h"
 #include "app/failure.h"
 #include "app/pointer.h"
+#include "app/programfiles.h"
 #include "app/trap.h"
 #include "names/database.h"
 #include "names/namelists.h"
@@ -31,13 +32,6 @@ constexpr qint64 BulkFileBytes = 4 * 1024 * 1024;
 
 // How much of an overlong name its report quotes.
 constexpr qsizetype QuotedLength = 40;
-
-bool fileExists(const QString& path)
-{
-    if (path.isEmpty() || path.contains(QChar(u'\0')))
-        return false;
-    return QFileInfo::exists(path);
-}
 
 // The insert for the list the source option chooses; none with neither
 // option selected. First names added to the built-in list join its female
@@ -209,7 +203,7 @@ void ListEditor::importFiles(ListKind kind, const QString& location)
 void ListEditor::FileToListview(const QString& path, ListKind kind)
 {
     Trap trap(m_dialogs, u"in Tessmark.Main.FileToListview "_s, ClosingLine::Long);
-    if (!fileExists(path)) {
+    if (!FileExists(path)) {
         refuse(m_dialogs, u"File not found"_s);
         return;
     }
