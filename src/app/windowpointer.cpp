@@ -2,6 +2,7 @@
 
 #include <QAbstractScrollArea>
 #include <QEvent>
+#include <QGuiApplication>
 #include <QWidget>
 
 namespace {
@@ -47,6 +48,10 @@ void WindowPointer::setMousePointer(int pointer)
     switch (pointer) {
     case MousePointer::Hourglass:
         m_window->setCursor(Qt::WaitCursor);
+        // The long operation that follows does not return to the event
+        // loop, which would otherwise be what hands the change to the
+        // display server.
+        QGuiApplication::sync();
         break;
     case MousePointer::Custom:
         m_window->setCursor(m_custom.value_or(QCursor(Qt::ArrowCursor)));
