@@ -171,7 +171,7 @@ private Q_SLOTS:
 
         // Start from the other pointer, so that the move has to change it.
         results().pointer().setMousePointer(MousePointer::Custom + MousePointer::Default - pointer);
-        QMouseEvent move(QEvent::MouseMove, QPointF(), Qt::NoButton, Qt::NoButton, Qt::NoModifier);
+        QMouseEvent move(QEvent::MouseMove, {}, {}, Qt::NoButton, Qt::NoButton, Qt::NoModifier);
         QApplication::sendEvent(w, &move);
         QCOMPARE(results().pointer().mousePointer(), pointer);
     }
