@@ -23,3 +23,9 @@ inline QStringList shownColumn(QWidget& window, const QString& view, int column 
         texts.append(model->index(row, column).data().toString());
     return texts;
 }
+
+// How many rows a list view shows.
+inline int shownRowCount(QWidget& window, const QString& view)
+{
+    return control<QAbstractItemView>(window, view)->model()->rowCount();
+}

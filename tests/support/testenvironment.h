@@ -6,6 +6,8 @@
 #include "support/fakedialogs.h"
 #include "support/fakeplatform.h"
 
+#include <QDir>
+#include <QFile>
 #include <QStringList>
 #include <QTemporaryDir>
 
@@ -45,3 +47,20 @@ void createEmptyDatabase(const QString& path);
 QStringList tableColumn(const QString& databasePath, const QString& table, const QString& column);
 void insertRows(const QString& databasePath, const QString& table, const QString& column,
                 const QStringList& values);
+
+// Whole files, for fixtures; a file that cannot be read or written ends the run.
+inline QByteArray fileBytes(const QString& path)
+{
+    QFile file(path);
+    if (!file.open(QIODevice::ReadOnly))
+        qFatal("cannot read %s", qPrintable(path));
+    return file.readAll();
+}
+
+inline void writeBytes(const QString& path, const QByteArray& bytes)
+{
+    QDir().mkpath(QFileInfo(path).path());
+    QFile file(path);
+    if (!file.open(QIODevice::WriteOnly) || file.write(bytes) != bytes.size())
+        qFatal("cannot write %s", qPrintable(path));
+}
