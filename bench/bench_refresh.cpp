@@ -77,9 +77,10 @@ int main(int argc, char** argv)
     NoPointer pointer;
     NameLists lists(path, pointer);
     const double builtIn = medianMs(lists, ListChoice{true, false, true, false, false}, 9);
-    std::printf("RefreshLists, built-in list, Both: %lld + %lld names, median %.1f ms (goal 100 ms)\n",
-                static_cast<long long>(lists.firstPane().count()),
-                static_cast<long long>(lists.lastPane().count()), builtIn);
+    std::printf(
+        "RefreshLists, built-in list, Both: %lld + %lld names, median %.1f ms (goal 100 ms)\n",
+        static_cast<long long>(lists.firstPane().count()),
+        static_cast<long long>(lists.lastPane().count()), builtIn);
 
     fillUserList(path, 1000000);
     const double user = medianMs(lists, ListChoice{false, true, true, false, false}, 3);

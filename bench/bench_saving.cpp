@@ -29,7 +29,8 @@ constexpr double WorkbookLimitMB = 64;
 
 class GeneratedRows : public ResultRows {
 public:
-    explicit GeneratedRows(int count) {
+    explicit GeneratedRows(int count)
+    {
         std::mt19937 random(11);
         std::uniform_int_distribution<int> length(3, 9);
         std::uniform_int_distribution<int> letter('a', 'z');
@@ -64,7 +65,8 @@ public:
 };
 
 // Peak resident memory of this process so far, in kB.
-long peakKb() {
+long peakKb()
+{
     QFile status(u"/proc/self/status"_s);
     if (!status.open(QIODevice::ReadOnly))
         return -1;
@@ -77,19 +79,22 @@ long peakKb() {
 
 // CPU time of this process so far, in ms: unlike the clock on the wall it
 // does not grow when other programs share the processor.
-double cpuMs() {
+double cpuMs()
+{
     timespec now{};
     clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &now);
     return double(now.tv_sec) * 1e3 + double(now.tv_nsec) / 1e6;
 }
 
-const char* verdict(bool ok) {
+const char* verdict(bool ok)
+{
     return ok ? "ok" : "OVER LIMIT";
 }
 
 } // namespace
 
-int main(int argc, char** argv) {
+int main(int argc, char** argv)
+{
     QCoreApplication app(argc, argv);
     QTemporaryDir dir;
     const GeneratedRows rows(Rows);

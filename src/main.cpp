@@ -15,7 +15,7 @@ int main(int argc, char** argv)
     DesktopShell shell;
     SystemClock clock;
     RandomSource random;
-    Environment environment{
-        dialogs, settings, shell, clock, random, QCoreApplication::applicationDirPath()};
+    Environment environment{dialogs, settings, shell,
+                            clock,   random,   QCoreApplication::applicationDirPath()};
     return runProgram(app, environment);
 }

@@ -67,13 +67,13 @@ int main(int argc, char** argv)
         std::cerr << "makedb: cannot create " << temporary << '\n';
         return 1;
     }
-    bool ok = check(db, sqlite3_exec(db, "begin", nullptr, nullptr, nullptr), "begin")
-              && check(db, sqlite3_exec(db, schema.str().c_str(), nullptr, nullptr, nullptr),
-                       "schema")
-              && fill(db, "insert into system_mfirstname (Mfirst) values (?)", argv[3])
-              && fill(db, "insert into system_ffirstname (Ffirst) values (?)", argv[4])
-              && fill(db, "insert into system_lastname ([Last]) values (?)", argv[5])
-              && check(db, sqlite3_exec(db, "commit", nullptr, nullptr, nullptr), "commit");
+    bool ok =
+        check(db, sqlite3_exec(db, "begin", nullptr, nullptr, nullptr), "begin")
+        && check(db, sqlite3_exec(db, schema.str().c_str(), nullptr, nullptr, nullptr), "schema")
+        && fill(db, "insert into system_mfirstname (Mfirst) values (?)", argv[3])
+        && fill(db, "insert into system_ffirstname (Ffirst) values (?)", argv[4])
+        && fill(db, "insert into system_lastname ([Last]) values (?)", argv[5])
+        && check(db, sqlite3_exec(db, "commit", nullptr, nullptr, nullptr), "commit");
     sqlite3_close(db);
     if (!ok || std::rename(temporary.c_str(), output.c_str()) != 0) {
         std::remove(temporary.c_str());

@@ -10,8 +10,8 @@ QString errorReportText(const QString& description, const QString& location, int
     const QString closingLine = closing == ClosingLine::Long
                                     ? u"Please email screenshot of this message to "_s
                                     : u"Please email "_s;
-    return description % u"\r\n"_s % location % u"at line "_s % QString::number(line)
-           % u"\r\r"_s % closingLine % SupportAddress;
+    return description % u"\r\n"_s % location % u"at line "_s % QString::number(line) % u"\r\r"_s
+           % closingLine % SupportAddress;
 }
 
 void ShowErrorReport(Dialogs& dialogs, const QString& description, const QString& location,

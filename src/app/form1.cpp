@@ -1,12 +1,12 @@
 #include "app/form1.h"
 
 #include "app/dialogs.h"
-#include "app/randomvisit.h"
+#include "app/layout.h"
 #include "app/programicon.h"
+#include "app/randomvisit.h"
 #include "app/settings.h"
 #include "app/splash.h"
 #include "app/trap.h"
-#include "app/layout.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
@@ -40,11 +40,10 @@ const QString HelpText =
     "2. You can generate using your User List. In this case, names can be loaded from a text "
     "file or added one at a time."_s;
 
-QTableView* pane(QWidget* container, const QString& name, const QString& caption,
-                 PaneModel& model)
+QTableView* pane(QWidget* container, const QString& name, const QString& caption, PaneModel& model)
 {
-    QTableView* view = Layout::reportView(container, name, caption,
-                                          twipsRect(240, 300, 7320, 1320), &model);
+    QTableView* view =
+        Layout::reportView(container, name, caption, twipsRect(240, 300, 7320, 1320), &model);
     view->setToolTip(PaneToolTip);
     return view;
 }
@@ -86,20 +85,24 @@ void Form1::buildLayout()
     setFont(arialBold(9));
     Layout::paintWhite(this);
 
-    PushButton8 = Layout::pushButton(this, u"PushButton8"_s, u"Help"_s, twipsRect(120, 120, 7800, 405));
+    PushButton8 =
+        Layout::pushButton(this, u"PushButton8"_s, u"Help"_s, twipsRect(120, 120, 7800, 405));
 
-    Frame4 = Layout::frame(this, u"Frame4"_s, u"Generate Options"_s, twipsRect(120, 600, 7800, 1850));
+    Frame4 =
+        Layout::frame(this, u"Frame4"_s, u"Generate Options"_s, twipsRect(120, 600, 7800, 1850));
     Option9 = Layout::optionButton(Frame4, u"Option9"_s,
-                     u"Orvell's List - Generate random names from my list of names"_s,
-                     twipsRect(240, 300, 6300, 255));
+                                   u"Orvell's List - Generate random names from my list of names"_s,
+                                   twipsRect(240, 300, 6300, 255));
     Frame1 = Layout::frame(Frame4, u"Frame1"_s, u"Gender Options (Orvell's List)"_s,
-                   twipsRect(600, 570, 4320, 735));
+                           twipsRect(600, 570, 4320, 735));
     Option1 = Layout::optionButton(Frame1, u"Option1"_s, u"Both"_s, twipsRect(240, 300, 1020, 255));
-    Option2 = Layout::optionButton(Frame1, u"Option2"_s, u"Male Only"_s, twipsRect(1260, 300, 1335, 255));
-    Option3 = Layout::optionButton(Frame1, u"Option3"_s, u"Female Only"_s, twipsRect(2610, 300, 1455, 255));
+    Option2 =
+        Layout::optionButton(Frame1, u"Option2"_s, u"Male Only"_s, twipsRect(1260, 300, 1335, 255));
+    Option3 = Layout::optionButton(Frame1, u"Option3"_s, u"Female Only"_s,
+                                   twipsRect(2610, 300, 1455, 255));
     Option8 = Layout::optionButton(Frame4, u"Option8"_s,
-                     u"User List - Generate random names from your list of names"_s,
-                     twipsRect(225, 1440, 6015, 255));
+                                   u"User List - Generate random names from your list of names"_s,
+                                   twipsRect(225, 1440, 6015, 255));
     // Explicit groups: Qt's automatic grouping would reach into Frame1 and
     // take the gender options for members of the source group.
     for (QRadioButton* o : {Option9, Option8})
@@ -110,30 +113,33 @@ void Form1::buildLayout()
     Option1->setChecked(true);
 
     Frame3 = Layout::frame(this, u"Frame3"_s, u"How many names would you like to generate?"_s,
-                   twipsRect(120, 2505, 7800, 825));
+                           twipsRect(120, 2505, 7800, 825));
     Text1 = Layout::place<QLineEdit>(Frame3, u"Text1"_s, twipsRect(240, 300, 7305, 375));
     Text1->setText(u"Text1"_s);
     Text1->setAccessibleName(Frame3->title());
 
     Frame6 = Layout::frame(this, u"Frame6"_s, u"First Names"_s, twipsRect(120, 3390, 7800, 2775));
     ListView2 = pane(Frame6, u"ListView2"_s, Frame6->title(), m_lists.firstPane());
-    PushButton2 =
-        Layout::pushButton(Frame6, u"PushButton2"_s, u"Add First Name"_s, twipsRect(240, 1695, 3600, 405));
+    PushButton2 = Layout::pushButton(Frame6, u"PushButton2"_s, u"Add First Name"_s,
+                                     twipsRect(240, 1695, 3600, 405));
     PushButton6 = Layout::pushButton(Frame6, u"PushButton6"_s, u"Load First Names From File"_s,
-                         twipsRect(3940, 1695, 3600, 405));
-    PushButton4 = Layout::pushButton(Frame6, u"PushButton4"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
+                                     twipsRect(3940, 1695, 3600, 405));
+    PushButton4 =
+        Layout::pushButton(Frame6, u"PushButton4"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
 
     Frame5 = Layout::frame(this, u"Frame5"_s, u"Last Names"_s, twipsRect(120, 6240, 7800, 2775));
     ListView1 = pane(Frame5, u"ListView1"_s, Frame5->title(), m_lists.lastPane());
-    PushButton5 =
-        Layout::pushButton(Frame5, u"PushButton5"_s, u"Add Last Name"_s, twipsRect(240, 1695, 3600, 400));
+    PushButton5 = Layout::pushButton(Frame5, u"PushButton5"_s, u"Add Last Name"_s,
+                                     twipsRect(240, 1695, 3600, 400));
     PushButton7 = Layout::pushButton(Frame5, u"PushButton7"_s, u"Load Last Names From File"_s,
-                         twipsRect(3975, 1695, 3600, 405));
-    PushButton3 = Layout::pushButton(Frame5, u"PushButton3"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
+                                     twipsRect(3975, 1695, 3600, 405));
+    PushButton3 =
+        Layout::pushButton(Frame5, u"PushButton3"_s, u"Delete"_s, twipsRect(240, 2190, 7320, 405));
 
-    PushButton1 =
-        Layout::pushButton(this, u"PushButton1"_s, u"Start Generating"_s, twipsRect(120, 9140, 7800, 405));
-    ProgressBar1 = Layout::place<QProgressBar>(this, u"ProgressBar1"_s, twipsRect(120, 9660, 7800, 405));
+    PushButton1 = Layout::pushButton(this, u"PushButton1"_s, u"Start Generating"_s,
+                                     twipsRect(120, 9140, 7800, 405));
+    ProgressBar1 =
+        Layout::place<QProgressBar>(this, u"ProgressBar1"_s, twipsRect(120, 9660, 7800, 405));
     ProgressBar1->setRange(0, 100);
     ProgressBar1->setValue(0);
     ProgressBar1->setTextVisible(false);
@@ -154,9 +160,9 @@ void Form1::buildLayout()
     for (QWidget* control : std::initializer_list<QWidget*>{Frame1, Frame3, Frame4, Frame5, Frame6,
                                                             Option8, Option9, ListView1, ListView2})
         m_pointer->watch(control, MousePointer::Default);
-    for (QWidget* control : std::initializer_list<QWidget*>{PushButton1, PushButton2, PushButton3,
-                                                            PushButton4, PushButton5, PushButton6,
-                                                            PushButton7, PushButton8})
+    for (QWidget* control :
+         std::initializer_list<QWidget*>{PushButton1, PushButton2, PushButton3, PushButton4,
+                                         PushButton5, PushButton6, PushButton7, PushButton8})
         m_pointer->watch(control, MousePointer::Custom);
     for (QWidget* control :
          std::initializer_list<QWidget*>{Option1, Option2, Option3, Text1, ProgressBar1})
@@ -184,9 +190,9 @@ void Form1::wireHandlers()
 
     for (QTableView* view : {ListView1, ListView2}) {
         view->installEventFilter(this);
-        connect(view, &QTableView::doubleClicked, this,
-                [this, view] { ListView_Remove(view, view == ListView1 ? m_lists.lastPane()
-                                                                       : m_lists.firstPane()); });
+        connect(view, &QTableView::doubleClicked, this, [this, view] {
+            ListView_Remove(view, view == ListView1 ? m_lists.lastPane() : m_lists.firstPane());
+        });
     }
 
     connect(PushButton1, &QPushButton::clicked, this, &Form1::PushButton1_Click);
@@ -255,8 +261,8 @@ void Form1::restoreOption(QRadioButton* option, bool selected)
 
 ListChoice Form1::listChoice() const
 {
-    return {Option9->isChecked(), Option8->isChecked(), Option1->isChecked(),
-            Option2->isChecked(), Option3->isChecked()};
+    return {Option9->isChecked(), Option8->isChecked(), Option1->isChecked(), Option2->isChecked(),
+            Option3->isChecked()};
 }
 
 void Form1::closeEvent(QCloseEvent* event)

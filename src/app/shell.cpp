@@ -14,7 +14,8 @@ using namespace Qt::StringLiterals;
 namespace {
 
 // Runs one of the desktop's query tools and gives what it printed.
-QString ask(const QString& program, const QStringList& arguments) {
+QString ask(const QString& program, const QStringList& arguments)
+{
     QProcess query;
     query.start(program, arguments);
     if (!query.waitForStarted(5000))
@@ -28,14 +29,15 @@ QString ask(const QString& program, const QStringList& arguments) {
 // Whether the desktop entry that the association names is installed, looked
 // for the way xdg-open looks: in every applications folder and below it,
 // with "vendor-app.desktop" also found as "vendor/app.desktop".
-bool desktopEntryInstalled(const QString& entry) {
+bool desktopEntryInstalled(const QString& entry)
+{
     QString nested = entry;
     if (const qsizetype dash = nested.indexOf(u'-'); dash > 0)
         nested[dash] = u'/';
     for (const QString& folder :
          QStandardPaths::standardLocations(QStandardPaths::ApplicationsLocation)) {
-        if (QFileInfo::exists(QDir(folder).filePath(entry)) ||
-            QFileInfo::exists(QDir(folder).filePath(nested)))
+        if (QFileInfo::exists(QDir(folder).filePath(entry))
+            || QFileInfo::exists(QDir(folder).filePath(nested)))
             return true;
         QDirIterator below(folder, {entry}, QDir::Files, QDirIterator::Subdirectories);
         if (below.hasNext())
@@ -46,7 +48,8 @@ bool desktopEntryInstalled(const QString& entry) {
 
 } // namespace
 
-void DesktopShell::openWebPage(const QUrl& url) {
+void DesktopShell::openWebPage(const QUrl& url)
+{
     QProcess::startDetached(u"xdg-open"_s, {url.toString()});
 }
 
@@ -54,7 +57,8 @@ void DesktopShell::openWebPage(const QUrl& url) {
 // cannot tell whether a program opened the file; the desktop's association
 // for the file's type is asked first instead, which is what lets a missing
 // program be reported.
-void DesktopShell::openDocument(const QString& path) {
+void DesktopShell::openDocument(const QString& path)
+{
     const QFileInfo file(path);
     if (!file.isFile())
         throw Failure(u"The file %1 does not exist."_s.arg(QDir::toNativeSeparators(path)));

@@ -14,10 +14,7 @@ public:
     void seedFromTimeOfDay(double secondsSinceMidnight);
 
     // The next draw: a real r with 0 <= r < 1 and 53 bits of resolution.
-    double next()
-    {
-        return static_cast<double>(nextBits() >> 11) * 0x1.0p-53;
-    }
+    double next() { return static_cast<double>(nextBits() >> 11) * 0x1.0p-53; }
 
     std::uint64_t nextBits()
     {

@@ -35,8 +35,8 @@ void NameSplitter::chooseEncoding()
     // UTF-8 is decoded in whole characters (see decode()), each run of bytes
     // on its own. The byte-order mark is dropped by scan(), so that only the
     // one at the very start goes.
-    m_decoder.emplace(encoding, m_utf8 ? QStringConverter::Flag::Stateless |
-                                             QStringConverter::Flag::ConvertInitialBom
+    m_decoder.emplace(encoding, m_utf8 ? QStringConverter::Flag::Stateless
+                                             | QStringConverter::Flag::ConvertInitialBom
                                        : QStringConverter::Flag::ConvertInitialBom);
 }
 

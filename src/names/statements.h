@@ -13,8 +13,7 @@ struct Query {
 // User list.
 inline constexpr Query UserFirstNames{"select * from user_firstname order by firstname",
                                       "firstname"};
-inline constexpr Query UserLastNames{"select * from user_lastname order by lastname",
-                                     "lastname"};
+inline constexpr Query UserLastNames{"select * from user_lastname order by lastname", "lastname"};
 
 // Built-in list.
 inline constexpr Query BuiltInLastNames{"select * from system_lastname order by Last", "Last"};

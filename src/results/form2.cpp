@@ -1,7 +1,7 @@
 #include "results/form2.h"
 
-#include "app/trap.h"
 #include "app/layout.h"
+#include "app/trap.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
@@ -54,14 +54,18 @@ void Form2::buildLayout()
                                | QAbstractItemView::EditKeyPressed);
 
     Frame2 = Layout::frame(this, u"Frame2"_s, u"Output"_s, twipsRect(120, 5250, 6360, 690));
-    Option6 = Layout::optionButton(Frame2, u"Option6"_s, u"Excel (1 cell)"_s, twipsRect(3555, 240, 1695, 375));
-    Option4 = Layout::optionButton(Frame2, u"Option4"_s, u"Text File"_s, twipsRect(240, 240, 1335, 375));
-    Option5 = Layout::optionButton(Frame2, u"Option5"_s, u"Excel (2 cells)"_s, twipsRect(1575, 240, 1695, 375));
+    Option6 = Layout::optionButton(Frame2, u"Option6"_s, u"Excel (1 cell)"_s,
+                                   twipsRect(3555, 240, 1695, 375));
+    Option4 =
+        Layout::optionButton(Frame2, u"Option4"_s, u"Text File"_s, twipsRect(240, 240, 1335, 375));
+    Option5 = Layout::optionButton(Frame2, u"Option5"_s, u"Excel (2 cells)"_s,
+                                   twipsRect(1575, 240, 1695, 375));
     Option4->setChecked(true);
 
-    PushButton2 =
-        Layout::pushButton(this, u"PushButton2"_s, u"Start Saving Results"_s, twipsRect(1800, 6070, 4680, 405));
-    PushButton8 = Layout::pushButton(this, u"PushButton8"_s, u"< Back"_s, twipsRect(120, 6070, 1560, 405));
+    PushButton2 = Layout::pushButton(this, u"PushButton2"_s, u"Start Saving Results"_s,
+                                     twipsRect(1800, 6070, 4680, 405));
+    PushButton8 =
+        Layout::pushButton(this, u"PushButton8"_s, u"< Back"_s, twipsRect(120, 6070, 1560, 405));
 
     const QList<QWidget*> tabOrder{ListView1, Option6, Option4, Option5, PushButton2, PushButton8};
     for (qsizetype i = 1; i < tabOrder.size(); ++i)

@@ -30,7 +30,8 @@ ResultsSaver::ResultsSaver(Dialogs& dialogs, Shell& shell, QString cacheFolder)
     }
 }
 
-void ResultsSaver::save(OutputChoice choice, const ResultRows& rows) {
+void ResultsSaver::save(OutputChoice choice, const ResultRows& rows)
+{
     if (choice == OutputChoice::TextFile)
         saveTextFile(rows);
     else
@@ -40,7 +41,8 @@ void ResultsSaver::save(OutputChoice choice, const ResultRows& rows) {
 // Each step needs what the one before it made: after a failure the steps
 // that follow are not tried, since going on would write a partial text over
 // the user's file or report the same missing workbook once per row.
-void ResultsSaver::saveTextFile(const ResultRows& rows) {
+void ResultsSaver::saveTextFile(const ResultRows& rows)
+{
     Trap trap(m_dialogs, Location, ClosingLine::Long);
     QString path;
     if (!trap(10, [&] { path = m_dialogs.saveFileName(SaveDialogTitle, SaveDialogFilter); }))
@@ -53,7 +55,8 @@ void ResultsSaver::saveTextFile(const ResultRows& rows) {
     trap(30, [&] { WriteTextFile(text, path); });
 }
 
-void ResultsSaver::saveSpreadsheet(OutputChoice choice, const ResultRows& rows) {
+void ResultsSaver::saveSpreadsheet(OutputChoice choice, const ResultRows& rows)
+{
     Trap trap(m_dialogs, Location, ClosingLine::Long);
     std::optional<SpreadsheetApplication> spreadsheet;
     if (!trap(110, [&] { spreadsheet.emplace(m_shell, m_cacheFolder); }))

@@ -16,14 +16,16 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-QString cellName(int row, int column) {
+QString cellName(int row, int column)
+{
     QString letters;
     for (int n = column; n > 0; n = (n - 1) / 26)
         letters.prepend(QChar(u'A' + (n - 1) % 26));
     return letters + QString::number(row);
 }
 
-Failure writerFailure(lxw_error error, const QString& where = {}) {
+Failure writerFailure(lxw_error error, const QString& where = {})
+{
     const QString text = QString::fromUtf8(lxw_strerror(error));
     return Failure(where.isEmpty() ? text : u"%1 (%2)"_s.arg(text, where));
 }
@@ -33,9 +35,12 @@ Failure writerFailure(lxw_error error, const QString& where = {}) {
 SpreadsheetCell::SpreadsheetCell(Worksheet& sheet, int row, int column)
     : m_sheet(sheet)
     , m_row(row)
-    , m_column(column) {}
+    , m_column(column)
+{
+}
 
-SpreadsheetCell& SpreadsheetCell::operator=(const QString& text) {
+SpreadsheetCell& SpreadsheetCell::operator=(const QString& text)
+{
     if (m_row < 1 || m_column < 1)
         throw Failure(u"There is no cell at row %1, column %2"_s.arg(m_row).arg(m_column));
     QByteArray& utf8 = m_sheet.m_utf8;
@@ -51,46 +56,59 @@ SpreadsheetCell& SpreadsheetCell::operator=(const QString& text) {
 }
 
 Worksheet::Worksheet(lxw_worksheet* sheet)
-    : m_sheet(sheet) {}
+    : m_sheet(sheet)
+{
+}
 
-SpreadsheetCell Worksheet::cells(int row, int column) {
+SpreadsheetCell Worksheet::cells(int row, int column)
+{
     return SpreadsheetCell(*this, row, column);
 }
 
 Workbook::Workbook(lxw_workbook* book, lxw_worksheet* sheet)
     : m_book(book)
-    , m_sheet(sheet) {}
+    , m_sheet(sheet)
+{
+}
 
-Worksheet& Workbook::ActiveSheet() {
+Worksheet& Workbook::ActiveSheet()
+{
     return m_sheet;
 }
 
 WorkbookCollection::WorkbookCollection(SpreadsheetApplication& application)
-    : m_application(application) {}
+    : m_application(application)
+{
+}
 
-Workbook& WorkbookCollection::Add() {
+Workbook& WorkbookCollection::Add()
+{
     return m_application.addWorkbook();
 }
 
 SpreadsheetApplication::SpreadsheetApplication(Shell& shell, QString folder)
     : m_shell(shell)
     , m_folder(std::move(folder))
-    , m_workbooks(*this) {
+    , m_workbooks(*this)
+{
     if (!QDir().mkpath(m_folder))
         throw Failure(u"The folder %1 could not be made"_s.arg(QDir::toNativeSeparators(m_folder)));
 }
 
-SpreadsheetApplication::~SpreadsheetApplication() {
+SpreadsheetApplication::~SpreadsheetApplication()
+{
     discardWorkbook();
 }
 
-Workbook& SpreadsheetApplication::ActiveWorkbook() {
+Workbook& SpreadsheetApplication::ActiveWorkbook()
+{
     if (!m_active)
         throw Failure(u"There is no workbook"_s);
     return *m_active;
 }
 
-Workbook& SpreadsheetApplication::addWorkbook() {
+Workbook& SpreadsheetApplication::addWorkbook()
+{
     if (m_active || m_visible)
         throw Failure(u"The spreadsheet already holds a workbook"_s);
 
@@ -130,7 +148,8 @@ Workbook& SpreadsheetApplication::addWorkbook() {
     return *m_active;
 }
 
-void SpreadsheetApplication::discardWorkbook() {
+void SpreadsheetApplication::discardWorkbook()
+{
     if (m_active) {
         lxw_workbook_free(m_active->m_book);
         m_active.reset();
@@ -141,7 +160,8 @@ void SpreadsheetApplication::discardWorkbook() {
     }
 }
 
-void SpreadsheetApplication::setVisible(bool visible) {
+void SpreadsheetApplication::setVisible(bool visible)
+{
     if (!visible || m_visible)
         return;
     if (!m_active)

@@ -11,7 +11,8 @@
 
 using namespace Qt::StringLiterals;
 
-QByteArray resultsText(const ResultRows& rows) {
+QByteArray resultsText(const ResultRows& rows)
+{
     // Each name is encoded straight into the end of one buffer: no text of
     // the whole list is built twice, and no small array is made per name.
     QStringEncoder encoder(QStringEncoder::System, QStringEncoder::Flag::Stateless);
@@ -37,7 +38,8 @@ QByteArray resultsText(const ResultRows& rows) {
     return bytes;
 }
 
-void WriteTextFile(const QByteArray& text, const QString& path) {
+void WriteTextFile(const QByteArray& text, const QString& path)
+{
     const auto fail = [&path](const QString& reason) {
         return Failure(
             u"The file %1 could not be saved: %2"_s.arg(QDir::toNativeSeparators(path), reason));
