@@ -45,8 +45,7 @@ TestEnvironment::TestEnvironment(bool shippedDatabase)
     : settings((useTemporarySettings(), std::make_unique<Settings>()))
     , environment{dialogs, *settings, shell, clock, random, m_folder.path()}
 {
-    if (shippedDatabase
-        && !QFile::copy(QString::fromUtf8(QUILLANE_SHIPPED_DB), databasePath()))
+    if (shippedDatabase && !QFile::copy(QString::fromUtf8(QUILLANE_SHIPPED_DB), databasePath()))
         qFatal("cannot copy the shipped database");
     QFile(databasePath()).setPermissions(QFile::ReadOwner | QFile::WriteOwner);
 }
@@ -73,12 +72,14 @@ QStringList tableColumn(const QString& databasePath, const QString& table, const
 {
     Db db(databasePath);
     sqlite3_stmt* stmt = nullptr;
-    const QByteArray sql = QString(u"select "_s + column + u" from "_s + table + u" order by rowid"_s).toUtf8();
+    const QByteArray sql =
+        QString(u"select "_s + column + u" from "_s + table + u" order by rowid"_s).toUtf8();
     if (sqlite3_prepare_v2(db.handle, sql.constData(), -1, &stmt, nullptr) != SQLITE_OK)
         qFatal("%s", sqlite3_errmsg(db.handle));
     QStringList values;
     while (sqlite3_step(stmt) == SQLITE_ROW)
-        values.append(QString::fromUtf8(reinterpret_cast<const char*>(sqlite3_column_text(stmt, 0))));
+        values.append(
+            QString::fromUtf8(reinterpret_cast<const char*>(sqlite3_column_text(stmt, 0))));
     sqlite3_finalize(stmt);
     return values;
 }
