@@ -8,6 +8,7 @@
 #include "app/form1.h"
 #include "app/settings.h"
 #include "app/shell.h"
+#include "benchsupport.h"
 #include "generate/generation.h"
 #include "generate/randomsource.h"
 #include "names/namelists.h"
@@ -31,58 +32,13 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-class PrintingDialogs : public Dialogs {
-public:
-    void messageBox(const QString& text, const QString& title, MessageIcon) override
-    {
-        std::printf("message: %s | %s\n", qUtf8Printable(title), qUtf8Printable(text));
-    }
-    QString inputBox(const QString&, const QString&) override { return {}; }
-    QStringList openFileNames(const QString&, const QString&) override { return {}; }
-    QString saveFileName(const QString&, const QString&) override { return {}; }
-};
-
-class NoShell : public Shell {
-public:
-    void openWebPage(const QUrl&) override {}
-    void openDocument(const QString&) override {}
-};
-
-class NoPointer : public PointerOwner {
-public:
-    int mousePointer() const override { return 0; }
-    void setMousePointer(int) override {}
-};
-
-// Peak resident memory of this process so far, in kB.
-long peakKilobytes()
-{
-    QFile status(u"/proc/self/status"_s);
-    if (!status.open(QIODevice::ReadOnly))
-        return -1;
-    for (const QByteArray& line : status.readAll().split('\n')) {
-        if (line.startsWith("VmHWM:"))
-            return line.mid(6).trimmed().split(' ').first().toLong();
-    }
-    return -1;
-}
-
-// Time this thread has run, in ms. On a shared machine the wall clock also
-// counts the time other processes held the cores; this does not.
-double threadCpuMs()
-{
-    timespec t{};
-    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &t);
-    return double(t.tv_sec) * 1e3 + double(t.tv_nsec) / 1e6;
-}
-
 constexpr int Names = 1000001;
 
 void benchClick(const QString& folder)
 {
-    PrintingDialogs dialogs;
+    Bench::SilentDialogs dialogs;
     Settings settings;
-    NoShell shell;
+    Bench::NoShell shell;
     SystemClock clock;
     RandomSource random;
     random.seed(20240601);
@@ -95,20 +51,20 @@ void benchClick(const QString& folder)
     form.findChild<QLineEdit*>(u"Text1"_s)->setText(QLocale::system().toString(1000000.6, 'f', 1));
     QApplication::processEvents();
 
-    const long before = peakKilobytes();
+    const long before = Bench::peakKilobytes();
     QElapsedTimer timer;
     timer.start();
-    const double cpuStart = threadCpuMs();
+    const double cpuStart = Bench::processorMs();
     form.findChild<QPushButton*>(u"PushButton1"_s)->click();
     const double shownMs = double(timer.nsecsElapsed()) / 1e6;
-    const double shownCpuMs = threadCpuMs() - cpuStart;
+    const double shownCpuMs = Bench::processorMs() - cpuStart;
     // The first paint of the results window, with its list laid out.
     Form2* results = form.resultsWindow();
     if (results)
         results->repaint();
     QApplication::processEvents();
     const double paintedMs = double(timer.nsecsElapsed()) / 1e6;
-    const long after = peakKilobytes();
+    const long after = Bench::peakKilobytes();
 
     const int rows = results ? results->results().rowCount() : -1;
     std::printf("Start Generating, built-in list, Both, %d names (%d rows, %lld + %lld in the "
@@ -125,7 +81,7 @@ void benchClick(const QString& folder)
 
 void benchCore(const QString& databasePath)
 {
-    NoPointer pointer;
+    Bench::NoPointer pointer;
     NameLists lists(databasePath, pointer);
     lists.RefreshLists(ListChoice{true, false, true, false, false});
     RandomSource random;
@@ -140,10 +96,10 @@ void benchCore(const QString& databasePath)
         updates = 0;
         QElapsedTimer timer;
         timer.start();
-        const double cpuStart = threadCpuMs();
+        const double cpuStart = Bench::processorMs();
         const GeneratedNames names = generator.generate(Names, [&updates](int) { ++updates; });
         seconds.push_back(double(timer.nsecsElapsed()) / 1e9);
-        cpuSeconds.push_back((threadCpuMs() - cpuStart) / 1e3);
+        cpuSeconds.push_back((Bench::processorMs() - cpuStart) / 1e3);
         rows = names.rows.size();
     }
     std::sort(seconds.begin(), seconds.end());
@@ -168,9 +124,7 @@ int main(int argc, char** argv)
 
     QApplication app(argc, argv);
     QTemporaryDir folder;
-    const QString path = folder.filePath(u"names.mdb"_s);
-    QFile::copy(QString::fromUtf8(QUILLANE_SHIPPED_DB), path);
-    QFile(path).setPermissions(QFile::ReadOwner | QFile::WriteOwner);
+    const QString path = Bench::shippedDatabaseCopy(folder);
 
     // The click first, so its memory figures are not raised by the core runs.
     benchClick(folder.path());

@@ -2,6 +2,7 @@
 // list, then the refresh that shows them, and the import of one 200 MB line.
 #include "app/dialogs.h"
 #include "app/pointer.h"
+#include "benchsupport.h"
 #include "names/listeditor.h"
 #include "names/namelists.h"
 
@@ -10,30 +11,12 @@
 #include <QFile>
 #include <QTemporaryDir>
 
-#include <sys/resource.h>
-
 #include <cstdio>
 #include <random>
 
 using namespace Qt::StringLiterals;
 
 namespace {
-
-class NoPointer : public PointerOwner {
-public:
-    int mousePointer() const override { return 0; }
-    void setMousePointer(int) override {}
-};
-
-// Counts what would have been shown; the benchmark never waits on a box.
-class CountingDialogs : public Dialogs {
-public:
-    void messageBox(const QString&, const QString&, MessageIcon) override { ++messages; }
-    QString inputBox(const QString&, const QString&) override { return {}; }
-    QStringList openFileNames(const QString&, const QString&) override { return {}; }
-    QString saveFileName(const QString&, const QString&) override { return {}; }
-    int messages = 0;
-};
 
 void writeNames(const QString& path, int count)
 {
@@ -63,39 +46,20 @@ double seconds(const QElapsedTimer& timer)
     return double(timer.nsecsElapsed()) / 1e9;
 }
 
-// The processor time this process has used: on a machine shared with other
-// work it says more than the wall clock.
-double cpuSeconds()
-{
-    rusage usage{};
-    getrusage(RUSAGE_SELF, &usage);
-    return double(usage.ru_utime.tv_sec + usage.ru_stime.tv_sec)
-           + double(usage.ru_utime.tv_usec + usage.ru_stime.tv_usec) / 1e6;
-}
-
-long maxRssMb()
-{
-    rusage usage{};
-    getrusage(RUSAGE_SELF, &usage);
-    return usage.ru_maxrss / 1024;
-}
-
 } // namespace
 
 int main(int argc, char** argv)
 {
     QCoreApplication app(argc, argv);
     QTemporaryDir dir;
-    const QString db = dir.filePath(u"names.mdb"_s);
-    QFile::copy(QString::fromUtf8(QUILLANE_SHIPPED_DB), db);
-    QFile(db).setPermissions(QFile::ReadOwner | QFile::WriteOwner);
+    const QString db = Bench::shippedDatabaseCopy(dir);
 
     constexpr int Count = 1'000'000;
     const QString names = dir.filePath(u"names.txt"_s);
     writeNames(names, Count);
 
-    NoPointer pointer;
-    CountingDialogs dialogs;
+    Bench::NoPointer pointer;
+    Bench::SilentDialogs dialogs;
     const ListChoice user{false, true, true, false, false};
     NameLists lists(db, pointer);
     ListEditor editor(dialogs, db, lists, pointer, [&] { return user; });
@@ -109,30 +73,31 @@ int main(int argc, char** argv)
         for (int i = 0; i < 200; ++i)
             file.write(block);
     }
-    const long before = maxRssMb();
+    const long before = Bench::peakKilobytes() / 1024;
     QElapsedTimer timer;
     timer.start();
     editor.FileToListview(line, ListKind::LastNames);
     std::printf("FileToListview, one line of 200 MB: %.2f s, %d message(s), peak memory %ld MB "
                 "(%ld MB before)\n",
-                seconds(timer), dialogs.messages, maxRssMb(), before);
+                seconds(timer), dialogs.messages, Bench::peakKilobytes() / 1024, before);
     timer.restart();
-    double cpu = cpuSeconds();
+    double cpu = Bench::processorMs() / 1e3;
     editor.FileToListview(names, ListKind::FirstNames);
     const double import = seconds(timer);
-    const double importCpu = cpuSeconds() - cpu;
+    const double importCpu = Bench::processorMs() / 1e3 - cpu;
     timer.restart();
-    cpu = cpuSeconds();
+    cpu = Bench::processorMs() / 1e3;
     lists.RefreshLists(user);
     const double refresh = seconds(timer);
-    const double refreshCpu = cpuSeconds() - cpu;
+    const double refreshCpu = Bench::processorMs() / 1e3 - cpu;
     std::printf("FileToListview, %d first names into the user list: %.2f s, processor %.2f s "
                 "(goal 3 s)\n",
                 Count, import, importCpu);
     std::printf("RefreshLists showing them: %lld first names, %.2f s, processor %.2f s (goal "
                 "1.5 s)\n",
                 static_cast<long long>(lists.firstPane().count()), refresh, refreshCpu);
-    std::printf("messages shown: %d; peak memory %ld MB\n", dialogs.messages, maxRssMb());
+    std::printf("messages shown: %d; peak memory %ld MB\n", dialogs.messages,
+                Bench::peakKilobytes() / 1024);
 
     return 0;
 }

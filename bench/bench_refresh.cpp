@@ -1,6 +1,7 @@
 // Times RefreshLists: on the shipped database with "Both" chosen, and on a
 // user list of a million first and a million last names.
 #include "app/pointer.h"
+#include "benchsupport.h"
 #include "names/namelists.h"
 
 #include <QCoreApplication>
@@ -18,12 +19,6 @@
 using namespace Qt::StringLiterals;
 
 namespace {
-
-class NoPointer : public PointerOwner {
-public:
-    int mousePointer() const override { return 0; }
-    void setMousePointer(int) override {}
-};
 
 void fillUserList(const QString& path, int count)
 {
@@ -70,11 +65,9 @@ int main(int argc, char** argv)
 {
     QCoreApplication app(argc, argv);
     QTemporaryDir dir;
-    const QString path = dir.filePath(u"names.mdb"_s);
-    QFile::copy(QString::fromUtf8(QUILLANE_SHIPPED_DB), path);
-    QFile(path).setPermissions(QFile::ReadOwner | QFile::WriteOwner);
+    const QString path = Bench::shippedDatabaseCopy(dir);
 
-    NoPointer pointer;
+    Bench::NoPointer pointer;
     NameLists lists(path, pointer);
     const double builtIn = medianMs(lists, ListChoice{true, false, true, false, false}, 9);
     std::printf(

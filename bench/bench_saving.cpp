@@ -2,6 +2,7 @@
 // writing it), and the workbook (building and writing it, without starting
 // a spreadsheet program), with the growth of the peak memory it needs.
 #include "app/shell.h"
+#include "benchsupport.h"
 #include "results/resultrows.h"
 #include "results/spreadsheet.h"
 #include "results/textfile.h"
@@ -57,35 +58,6 @@ private:
     std::vector<QString> m_last;
 };
 
-// Hands the workbook to nobody: the spreadsheet program is not timed.
-class NoShell : public Shell {
-public:
-    void openWebPage(const QUrl&) override {}
-    void openDocument(const QString&) override {}
-};
-
-// Peak resident memory of this process so far, in kB.
-long peakKb()
-{
-    QFile status(u"/proc/self/status"_s);
-    if (!status.open(QIODevice::ReadOnly))
-        return -1;
-    for (const QByteArray& line : status.readAll().split('\n')) {
-        if (line.startsWith("VmHWM:"))
-            return line.mid(6).trimmed().split(' ').first().toLong();
-    }
-    return -1;
-}
-
-// CPU time of this process so far, in ms: unlike the clock on the wall it
-// does not grow when other programs share the processor.
-double cpuMs()
-{
-    timespec now{};
-    clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &now);
-    return double(now.tv_sec) * 1e3 + double(now.tv_nsec) / 1e6;
-}
-
 const char* verdict(bool ok)
 {
     return ok ? "ok" : "OVER LIMIT";
@@ -100,13 +72,13 @@ int main(int argc, char** argv)
     const GeneratedRows rows(Rows);
 
     // The workbook first, so that its peak is measured before the text's.
-    const long peakBefore = peakKb();
+    const long peakBefore = Bench::peakKilobytes();
     QElapsedTimer timer;
     timer.start();
-    const double workbookCpuStart = cpuMs();
+    const double workbookCpuStart = Bench::processorMs();
     QString document;
     {
-        NoShell shell;
+        Bench::NoShell shell;
         SpreadsheetApplication spreadsheet(shell, dir.path());
         spreadsheet.Workbooks().Add();
         Worksheet& sheet = spreadsheet.ActiveWorkbook().ActiveSheet();
@@ -118,8 +90,8 @@ int main(int argc, char** argv)
         document = spreadsheet.documentPath();
     }
     const double workbookMs = double(timer.nsecsElapsed()) / 1e6;
-    const double workbookCpuMs = cpuMs() - workbookCpuStart;
-    const double workbookMB = double(peakKb() - peakBefore) / 1024.0;
+    const double workbookCpuMs = Bench::processorMs() - workbookCpuStart;
+    const double workbookMB = double(Bench::peakKilobytes() - peakBefore) / 1024.0;
     std::printf("workbook (2 cells), %d rows: %.0f ms (limit %.0f) %s, %.0f ms of CPU; "
                 "peak memory +%.1f MB (limit %.0f) %s; file %.1f MB\n",
                 Rows, workbookMs, WorkbookLimitMs, verdict(workbookMs <= WorkbookLimitMs),
@@ -132,12 +104,12 @@ int main(int argc, char** argv)
     std::vector<double> building;
     for (int run = 0; run < 5; ++run) {
         timer.start();
-        const double cpuStart = cpuMs();
+        const double cpuStart = Bench::processorMs();
         const QByteArray text = resultsText(rows);
         building.push_back(double(timer.nsecsElapsed()) / 1e6);
         WriteTextFile(text, path);
         times.push_back(double(timer.nsecsElapsed()) / 1e6);
-        cpu.push_back(cpuMs() - cpuStart);
+        cpu.push_back(Bench::processorMs() - cpuStart);
     }
     std::sort(times.begin(), times.end());
     std::sort(cpu.begin(), cpu.end());

@@ -315,24 +315,24 @@ void Form1::Option3_Click()
 
 void Form1::Option8_Click()
 {
-    const ListChoice choice = listChoice();
-    PushButton4->setText(deleteButtonCaption(choice));
-    PushButton3->setText(deleteButtonCaption(choice));
-    storeSourceOptions(m_env.settings, choice);
-    for (QRadioButton* gender : {Option1, Option2, Option3})
-        gender->setEnabled(false);
-    m_lists.RefreshLists(listChoice());
+    sourceOptionClick(false);
 }
 
 void Form1::Option9_Click()
 {
+    sourceOptionClick(true);
+}
+
+void Form1::sourceOptionClick(bool gendersEnabled)
+{
+    // The gender only means something for the built-in list.
     const ListChoice choice = listChoice();
     PushButton4->setText(deleteButtonCaption(choice));
     PushButton3->setText(deleteButtonCaption(choice));
     storeSourceOptions(m_env.settings, choice);
     for (QRadioButton* gender : {Option1, Option2, Option3})
-        gender->setEnabled(true);
-    m_lists.RefreshLists(listChoice());
+        gender->setEnabled(gendersEnabled);
+    m_lists.RefreshLists(choice);
 }
 
 void Form1::ListView_Remove(QTableView* pane, PaneModel& model)

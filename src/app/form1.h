@@ -70,6 +70,7 @@ private:
     void Option3_Click();
     void Option8_Click();
     void Option9_Click();
+    void sourceOptionClick(bool gendersEnabled);
     void ListView_Remove(QTableView* pane, PaneModel& model);
     void PushButton1_Click();
     void PushButton2_Click();
