@@ -126,6 +126,19 @@ private Q_SLOTS:
         QCOMPARE(control<QTableView>(results(), u"ListView1"_s)->horizontalHeader()->count(), 2);
     }
 
+    void aRetypedFirstNameIsSavedUntilTheNextRun()
+    {
+        QAbstractItemModel* model = control<QTableView>(results(), u"ListView1"_s)->model();
+        QVERIFY(model->setData(model->index(1, 0), u"Zoe"_s, Qt::EditRole));
+        QVERIFY(!model->setData(model->index(1, 1), u"Ray"_s, Qt::EditRole)); // last names stay
+        env->dialogs.answerSave(env->filePath(u"names.txt"_s));
+        click(u"PushButton2"_s);
+        QCOMPARE(fileBytes(env->filePath(u"names.txt"_s)), QByteArray("Ann Lee\r\nZoe Lee\r\n"));
+        click(u"PushButton8"_s);
+        generate(u"2"_s);
+        QCOMPARE(shownColumn(results(), u"ListView1"_s), QStringList(2, u"Ann"_s));
+    }
+
     void savingFollowsTheChosenOutput_data()
     {
         QTest::addColumn<QString>("option");

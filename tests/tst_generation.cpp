@@ -18,21 +18,26 @@ private Q_SLOTS:
     {
         QTest::addColumn<QString>("text");
         QTest::addColumn<QString>("reading"); // the count, or why there is none
-        QTest::newRow("one million passes") << u"1000000"_s << u"1000000"_s;
-        QTest::newRow("one million and one refused") << u"1000001"_s << u"too many"_s;
-        QTest::newRow("just below the bound") << u"1000000.6"_s << u"1000001"_s;
-        QTest::newRow("2.5 to even 2") << u"2.5"_s << u"2"_s;
-        QTest::newRow("3.5 to even 4") << u"3.5"_s << u"4"_s;
-        QTest::newRow("blanks around") << u"  250 \t"_s << u"250"_s;
-        QTest::newRow("below 32 bits makes none") << u"-3e9"_s << u"0"_s;
-        QTest::newRow("digits then words") << u"12 names"_s << u"no number"_s;
-        QTest::newRow("nan") << u"nan"_s << u"no number"_s;
+        QTest::addColumn<QString>("locale");  // the user's number format
+        QTest::newRow("one million passes") << u"1000000"_s << u"1000000"_s << u"C"_s;
+        QTest::newRow("one million and one refused") << u"1000001"_s << u"too many"_s << u"C"_s;
+        QTest::newRow("just below the bound") << u"1000000.6"_s << u"1000001"_s << u"C"_s;
+        QTest::newRow("2.5 to even 2") << u"2.5"_s << u"2"_s << u"C"_s;
+        QTest::newRow("3.5 to even 4") << u"3.5"_s << u"4"_s << u"C"_s;
+        QTest::newRow("blanks around") << u"  250 \t"_s << u"250"_s << u"C"_s;
+        QTest::newRow("below 32 bits makes none") << u"-3e9"_s << u"0"_s << u"C"_s;
+        QTest::newRow("digits then words") << u"12 names"_s << u"no number"_s << u"C"_s;
+        QTest::newRow("nan") << u"nan"_s << u"no number"_s << u"C"_s;
+        QTest::newRow("decimal comma") << u"2,5"_s << u"2"_s << u"de_DE"_s;
+        QTest::newRow("grouped") << u"1.000.001"_s << u"too many"_s << u"de_DE"_s;
+        QTest::newRow("grouped, English") << u"1,000"_s << u"1000"_s << u"en_US"_s;
     }
 
     void readsTheCount()
     {
         QFETCH(QString, text);
-        const CountText read(text, QLocale::c());
+        QFETCH(QString, locale);
+        const CountText read(text, QLocale(locale));
         QTEST(!read.isNumber() ? u"no number"_s
               : read.tooMany() ? u"too many"_s
                                : QString::number(read.count()),
