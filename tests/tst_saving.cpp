@@ -146,7 +146,7 @@ private Q_SLOTS:
         QTest::addColumn<Names>("names");
         QTest::addColumn<QString>("cells");
 
-        const auto two = OutputChoice::ExcelTwoCells, one = OutputChoice::ExcelOneCell;
+        const auto two = OutputChoice::SpreadsheetTwoCells, one = OutputChoice::SpreadsheetOneCell;
         // Names that look like a number, a truth value and formulas stay text.
         const Names rows{{u"Ann"_s, u"Lee"_s}, {u"007"_s, u"TRUE"_s}, {u"=1+2"_s, u"1e5"_s}};
         QTest::newRow("2 cells") << two << rows << u"A1 Ann,B1 Lee,A2 007,B2 TRUE,A3 =1+2,B3 1e5"_s;

@@ -115,8 +115,8 @@ void Form2::PushButton8_Click()
 
 void Form2::PushButton2_Click()
 {
-    const OutputChoice choice = Option5->isChecked()   ? OutputChoice::ExcelTwoCells
-                                : Option6->isChecked() ? OutputChoice::ExcelOneCell
+    const OutputChoice choice = Option5->isChecked()   ? OutputChoice::SpreadsheetTwoCells
+                                : Option6->isChecked() ? OutputChoice::SpreadsheetOneCell
                                                        : OutputChoice::TextFile;
     ResultsSaver(m_env.dialogs, m_env.shell, QString()).save(choice, m_results);
 }

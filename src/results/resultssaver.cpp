@@ -69,7 +69,7 @@ void ResultsSaver::saveSpreadsheet(OutputChoice choice, const ResultRows& rows)
         Worksheet& sheet = spreadsheet->ActiveWorkbook().ActiveSheet();
         const int count = rows.rowCount();
         for (int row = 0; row < count; ++row) {
-            if (choice == OutputChoice::ExcelTwoCells) {
+            if (choice == OutputChoice::SpreadsheetTwoCells) {
                 sheet.cells(row + 1, 1) = rows.firstName(row);
                 sheet.cells(row + 1, 2) = rows.lastName(row);
             } else {
