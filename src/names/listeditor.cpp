@@ -7,10 +7,6 @@
 #include "app/trap.h"
 #include "names/database.h"
 #include "names/namelists.h"
-#include "names/namesplitter.h"
-
-#include <QFile>
-#include <QFileInfo>
 
 #include <optional>
 
@@ -21,43 +17,6 @@ namespace {
 const QString OpenTitle = u"Load List(s) - Hold Ctrl to select multiple list files"_s;
 const QString OpenFilter = u"Text Files (*.txt);;All Files (*)"_s;
 
-// Large enough to keep the reading cheap, small enough that a file of one
-// enormous line costs no more memory than this.
-constexpr qint64 ReadChunkBytes = 256 * 1024;
-
-// A file at least this large has its names inserted before the table's
-// indexes are built again, instead of each name updating them (about
-// 400,000 names and more); a smaller file costs less done name by name.
-constexpr qint64 BulkFileBytes = 4 * 1024 * 1024;
-
-// How much of an overlong name its report quotes.
-constexpr qsizetype QuotedLength = 40;
-
-// The insert for the list the source option chooses; none with neither
-// option selected. First names added to the built-in list join its female
-// table, whatever the gender.
-const char* insertStatement(ListKind kind, const ListChoice& choice)
-{
-    const bool first = kind == ListKind::FirstNames;
-    if (choice.builtIn)
-        return first ? Sql::InsertBuiltInFirstName : Sql::InsertBuiltInLastName;
-    if (choice.user)
-        return first ? Sql::InsertUserFirstName : Sql::InsertUserLastName;
-    return nullptr;
-}
-
-// The table an insert statement of the catalogue writes to.
-const char* insertTable(const char* insert)
-{
-    if (insert == Sql::InsertBuiltInFirstName)
-        return "system_ffirstname";
-    if (insert == Sql::InsertUserFirstName)
-        return "user_firstname";
-    if (insert == Sql::InsertBuiltInLastName)
-        return "system_lastname";
-    return "user_lastname";
-}
-
 Connection& opened(std::optional<Connection>& connection)
 {
     if (!connection)
@@ -65,10 +24,14 @@ Connection& opened(std::optional<Connection>& connection)
     return *connection;
 }
 
-[[noreturn]] void refuseOverlong(const QString& text)
+// The step of the delete button's handler that runs a built-in delete.
+int deleteLine(const char* sql)
 {
-    throw Failure(u"The name \"%1...\" is longer than %2 characters and was not stored."_s.arg(
-        text.left(QuotedLength), QString::number(NameSplitter::MaxNameLength)));
+    if (sql == Sql::DeleteBuiltInMaleFirstName)
+        return 20;
+    if (sql == Sql::DeleteBuiltInFemaleFirstName)
+        return 30;
+    return 40;
 }
 
 } // namespace
@@ -127,15 +90,9 @@ void ListEditor::addName(ListKind kind, const QString& location, const QString& 
     QString reply;
     trap(20, [&] { reply = m_dialogs.inputBox(prompt, ApplicationTitle); });
     trap(30, [&] {
-        const QString name = QString(reply).remove(u'\'');
-        if (name.trimmed().isEmpty())
-            return;
-        const char* insert = insertStatement(kind, choice);
-        if (!insert)
-            return;
-        if (name.size() > NameSplitter::MaxNameLength)
-            refuseOverlong(name);
-        opened(connection).execute(insert, name);
+        const QString name = nameToStore(reply, choice);
+        if (!name.isEmpty())
+            opened(connection).execute(insertStatement(kind, choice), name);
     });
     trap(40, [&] { connection.reset(); });
     trap(50, [&] { m_lists.RefreshLists(choice); });
@@ -162,21 +119,11 @@ void ListEditor::deleteNames(ListKind kind, int selectedRow, const QString& loca
         opened(connection).execute(sql, name);
     };
     if (choice.builtIn) {
-        if (kind == ListKind::FirstNames) {
-            if (choice.both || choice.male)
-                trap(20, [&] { deleteSelected(Sql::DeleteBuiltInMaleFirstName); });
-            if (choice.both || choice.female)
-                trap(30, [&] { deleteSelected(Sql::DeleteBuiltInFemaleFirstName); });
-        } else {
-            trap(40, [&] { deleteSelected(Sql::DeleteBuiltInLastName); });
-        }
+        for (const char* sql : builtInDeletes(kind, choice))
+            trap(deleteLine(sql), [&] { deleteSelected(sql); });
     } else if (choice.user) {
         // "Clear": the whole list goes, whatever is selected.
-        trap(50, [&] {
-            opened(connection)
-                .execute(kind == ListKind::FirstNames ? Sql::ClearUserFirstNames
-                                                      : Sql::ClearUserLastNames);
-        });
+        trap(50, [&] { opened(connection).execute(clearStatement(kind)); });
     }
     trap(60, [&] { connection.reset(); });
     trap(70, [&] { m_lists.RefreshLists(choice); });
@@ -214,66 +161,28 @@ void ListEditor::FileToListview(const QString& path, ListKind kind)
     std::optional<Connection> connection;
     if (!trap(10, [&] { connection.emplace(m_databasePath); }))
         return;
-    QFile file(path);
+    std::optional<NameFileImport> import;
     if (!trap(20, [&] {
-            // A device or a pipe could be read without end.
-            if (!QFileInfo(path).isFile())
-                throw Failure(u"This is not a file that names can be read from: %1"_s.arg(path));
-            if (!file.open(QIODevice::ReadOnly))
-                throw Failure(file.errorString());
+            import.emplace(*connection, path, sql);
+            import->openFile();
         }))
         return;
     if (!sql)
         return;
     // One commit for the whole file: a statement that fails changes nothing
     // and the names before it stay, and a million names take seconds.
-    std::optional<Connection::Transaction> transaction;
-    std::optional<Connection::Prepared> insert;
-    QList<QByteArray> indexes;
-    if (!trap(30, [&] {
-            // Room for the pages a large import touches.
-            connection->execute("pragma cache_size = -65536");
-            transaction.emplace(*connection);
-            if (file.size() >= BulkFileBytes)
-                indexes = connection->dropPlainIndexes(insertTable(sql));
-            insert.emplace(*connection, sql);
-        })) {
-        // Never commit a half-made start: the indexes must not go missing.
-        if (transaction) {
-            try {
-                transaction->rollback();
-            } catch (...) {
-                // The connection closes next, which undoes it all the same.
-            }
-        }
+    if (!trap(30, [&] { import->begin(); }))
         return;
-    }
 
-    NameSplitter splitter;
     std::vector<NameSplitter::Name> names;
-    QByteArray buffer(ReadChunkBytes, Qt::Uninitialized);
     int rejected = 0;
     bool reading = true;
     while (reading) {
         names.clear();
         reading = false;
-        trap(40, [&] {
-            const qint64 got = file.read(buffer.data(), buffer.size());
-            if (got < 0)
-                throw Failure(file.errorString());
-            if (got == 0) {
-                splitter.finish(names);
-                return;
-            }
-            splitter.feed(QByteArrayView(buffer.constData(), got), names);
-            reading = true;
-        });
+        trap(40, [&] { reading = import->readNames(names); });
         for (const NameSplitter::Name& name : names) {
-            const auto store = [&] {
-                if (name.overlong())
-                    refuseOverlong(name.text);
-                insert->run(name.text);
-            };
+            const auto store = [&] { import->store(name); };
             if (rejected < MaxReportsPerFile) {
                 if (!trap(50, store))
                     ++rejected;
@@ -294,10 +203,6 @@ void ListEditor::FileToListview(const QString& path, ListKind kind)
     });
     // Should an index fail to build, the names are kept all the same: the
     // panes are then slower to fill, never wrong.
-    trap(70, [&] {
-        insert.reset();
-        for (const QByteArray& index : std::as_const(indexes))
-            connection->execute(index.constData());
-    });
-    trap(80, [&] { transaction->commit(); });
+    trap(70, [&] { import->rebuildIndexes(); });
+    trap(80, [&] { import->commit(); });
 }

@@ -2,6 +2,7 @@
 
 #include "app/errorreport.h"
 #include "names/listchoice.h"
+#include "names/liststore.h"
 
 #include <QString>
 
@@ -10,9 +11,6 @@
 class Dialogs;
 class NameLists;
 class PointerOwner;
-
-// Which pane's list a button works on.
-enum class ListKind { FirstNames = 1, LastNames = 2 };
 
 // The work of the main window's add, delete and import buttons. Each
 // handler runs under its error trap, changes only the names database, and
