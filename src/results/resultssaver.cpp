@@ -65,18 +65,8 @@ void ResultsSaver::saveSpreadsheet(OutputChoice choice, const ResultRows& rows)
         return;
     // The whole fill is one step: a sheet that refuses a cell is reported
     // once, not once for every row after it.
-    const bool filled = trap(130, [&] {
-        Worksheet& sheet = spreadsheet->ActiveWorkbook().ActiveSheet();
-        const int count = rows.rowCount();
-        for (int row = 0; row < count; ++row) {
-            if (choice == OutputChoice::SpreadsheetTwoCells) {
-                sheet.cells(row + 1, 1) = rows.firstName(row);
-                sheet.cells(row + 1, 2) = rows.lastName(row);
-            } else {
-                sheet.cells(row + 1, 1) = rows.firstName(row) + u' ' + rows.lastName(row);
-            }
-        }
-    });
+    const bool filled =
+        trap(130, [&] { fillSheet(spreadsheet->ActiveWorkbook().ActiveSheet(), choice, rows); });
     // A workbook missing rows after the one that failed is not shown: the
     // user would take it for the whole list.
     if (!filled)

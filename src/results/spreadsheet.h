@@ -1,10 +1,13 @@
 #pragma once
 
+#include "results/outputchoice.h"
+
 #include <QByteArray>
 #include <QString>
 
 #include <memory>
 
+class ResultRows;
 class Shell;
 struct lxw_workbook;
 struct lxw_worksheet;
@@ -42,7 +45,7 @@ public:
     SpreadsheetCell cells(int row, int column);
 
 private:
-    friend class Workbook;
+    friend class WorkbookFile;
     friend class SpreadsheetCell;
     explicit Worksheet(lxw_worksheet* sheet);
 
@@ -52,16 +55,48 @@ private:
     QByteArray m_utf8;
 };
 
+// Writes the results list into a sheet from its first row on: the first
+// and last name in columns A and B, or the full name in column A.
+void fillSheet(Worksheet& sheet, OutputChoice layout, const ResultRows& rows);
+
+// An .xlsx file with one sheet, written as it is filled and built under a
+// hidden name of its own in its folder: it gets its real name only once it
+// is complete, so a failure halfway leaves nothing that looks like a
+// workbook of names. Destroyed before then, it leaves nothing behind.
+class WorkbookFile {
+public:
+    explicit WorkbookFile(const QString& folder);
+    ~WorkbookFile();
+    WorkbookFile(const WorkbookFile&) = delete;
+    WorkbookFile& operator=(const WorkbookFile&) = delete;
+
+    Worksheet& sheet() { return m_sheet; }
+
+    // Writes out the rest of the file, complete under its hidden name.
+    void close();
+    // Gives the closed file the name path. Without replace an existing file
+    // of that name stays and the answer is false; with it, the file takes
+    // the place of what was there in one step, keeping its permissions.
+    bool moveTo(const QString& path, bool replace);
+
+private:
+    void discard();
+
+    QString m_folder;
+    QString m_partPath;
+    lxw_workbook* m_book = nullptr;
+    Worksheet m_sheet;
+};
+
 class Workbook {
 public:
     Worksheet& ActiveSheet();
 
 private:
     friend class SpreadsheetApplication;
-    Workbook(lxw_workbook* book, lxw_worksheet* sheet);
+    explicit Workbook(const QString& folder);
 
-    lxw_workbook* m_book;
-    Worksheet m_sheet;
+    WorkbookFile m_file;
 };
 
 class WorkbookCollection {
@@ -106,13 +141,11 @@ public:
 private:
     friend class WorkbookCollection;
     Workbook& addWorkbook();
-    void discardWorkbook();
 
     Shell& m_shell;
     QString m_folder;
     WorkbookCollection m_workbooks;
     std::unique_ptr<Workbook> m_active;
-    QString m_partPath;
     QString m_documentPath;
     bool m_visible = false;
 };

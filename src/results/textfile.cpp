@@ -11,31 +11,92 @@
 
 using namespace Qt::StringLiterals;
 
-QByteArray resultsText(const ResultRows& rows)
+namespace {
+
+// Every row's bytes, in list order, in one buffer. Each name is encoded
+// straight into the end of the buffer: no text of the whole list is built
+// twice, and no small array is made per name. writeRow appends one row at
+// out, never more than room(first, last) bytes, and returns the new end.
+template <typename Room, typename WriteRow>
+QByteArray encodeRows(const ResultRows& rows, QByteArray bytes, Room room, WriteRow writeRow)
 {
-    // Each name is encoded straight into the end of one buffer: no text of
-    // the whole list is built twice, and no small array is made per name.
     QStringEncoder encoder(QStringEncoder::System, QStringEncoder::Flag::Stateless);
     const int count = rows.rowCount();
-    QByteArray bytes;
-    bytes.resize(qsizetype(count) * 18);
-    qsizetype used = 0;
+    qsizetype used = bytes.size();
+    bytes.resize(used + qsizetype(count) * 18);
     for (int row = 0; row < count; ++row) {
         const QString first = rows.firstName(row);
         const QString last = rows.lastName(row);
-        const qsizetype most = encoder.requiredSpace(first.size() + last.size()) + 3;
+        const qsizetype most = room(encoder, first, last);
         if (used + most > bytes.size())
             bytes.resize(std::max(bytes.size() * 2, used + most));
-        char* out = bytes.data() + used;
-        out = encoder.appendToBuffer(out, first);
-        *out++ = ' ';
-        out = encoder.appendToBuffer(out, last);
-        *out++ = '\r';
-        *out++ = '\n';
+        char* out = writeRow(encoder, bytes.data() + used, first, last);
         used = out - bytes.constData();
     }
     bytes.truncate(used);
     return bytes;
+}
+
+qsizetype plainRoom(QStringEncoder& encoder, const QString& first, const QString& last)
+{
+    return encoder.requiredSpace(first.size() + last.size()) + 3;
+}
+
+// A field as a CSV reader takes it back: quoted, with its quotes doubled,
+// when it holds a comma, a quote or a line end.
+QString csvField(const QString& name)
+{
+    const bool plain = std::none_of(name.cbegin(), name.cend(), [](QChar c) {
+        return c == u',' || c == u'"' || c == u'\r' || c == u'\n';
+    });
+    return plain ? name : u'"' + QString(name).replace(u"\""_s, u"\"\""_s) + u'"';
+}
+
+} // namespace
+
+QByteArray resultsText(const ResultRows& rows)
+{
+    return encodeRows(
+        rows, {}, plainRoom,
+        [](QStringEncoder& encoder, char* out, const QString& first, const QString& last) {
+            out = encoder.appendToBuffer(out, first);
+            *out++ = ' ';
+            out = encoder.appendToBuffer(out, last);
+            *out++ = '\r';
+            *out++ = '\n';
+            return out;
+        });
+}
+
+QByteArray resultsLines(const ResultRows& rows)
+{
+    return encodeRows(
+        rows, {}, plainRoom,
+        [](QStringEncoder& encoder, char* out, const QString& first, const QString& last) {
+            out = encoder.appendToBuffer(out, first);
+            *out++ = ' ';
+            out = encoder.appendToBuffer(out, last);
+            *out++ = '\n';
+            return out;
+        });
+}
+
+QByteArray resultsCsv(const ResultRows& rows)
+{
+    const auto room = [](QStringEncoder& encoder, const QString& first, const QString& last) {
+        // Quoting at most doubles a field and adds two quotes to each.
+        return encoder.requiredSpace(2 * (first.size() + last.size())) + 7;
+    };
+    return encodeRows(
+        rows, QByteArray("first_name,last_name\r\n"), room,
+        [](QStringEncoder& encoder, char* out, const QString& first, const QString& last) {
+            out = encoder.appendToBuffer(out, csvField(first));
+            *out++ = ',';
+            out = encoder.appendToBuffer(out, csvField(last));
+            *out++ = '\r';
+            *out++ = '\n';
+            return out;
+        });
 }
 
 void WriteTextFile(const QByteArray& text, const QString& path)

@@ -11,6 +11,13 @@ class ResultRows;
 // ends right after the last row's CR LF, so an empty list gives no bytes.
 QByteArray resultsText(const ResultRows& rows);
 
+// The same rows for other programs, in the results file's encoding: "first
+// last" and LF per row, or comma-separated values after the header line
+// "first_name,last_name", with CR LF line ends and a field quoted only when
+// it holds a comma, a quote or a line end.
+QByteArray resultsLines(const ResultRows& rows);
+QByteArray resultsCsv(const ResultRows& rows);
+
 // Writes text to path, replacing whatever the file held. The text goes to a
 // temporary file beside the target that takes the target's place only once
 // it is complete and on disk: a failure (no write access, a full disk, a
