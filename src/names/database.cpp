@@ -91,6 +91,16 @@ void Connection::execute(const char* sql, const QString& name)
         fail();
 }
 
+bool Connection::inTransaction() const
+{
+    return sqlite3_get_autocommit(m_db) == 0;
+}
+
+int Connection::changes() const
+{
+    return sqlite3_changes(m_db);
+}
+
 QStringList Connection::queryNames(const Sql::Query& query)
 {
     Statement stmt(m_db, query.text);

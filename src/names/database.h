@@ -68,6 +68,11 @@ public:
         sqlite3_stmt* m_stmt = nullptr;
     };
 
+    // True while a transaction is open on this connection.
+    bool inTransaction() const;
+    // How many rows the last insert or delete changed.
+    int changes() const;
+
     sqlite3* handle() const { return m_db; }
 
 private:

@@ -198,8 +198,7 @@ void ListEditor::FileToListview(const QString& path, ListKind kind)
     }
     trap(60, [&] {
         if (rejected > MaxReportsPerFile)
-            throw Failure(
-                u"%1 more names of this file were not stored."_s.arg(rejected - MaxReportsPerFile));
+            throw Failure(moreRejected(rejected - MaxReportsPerFile));
     });
     // Should an index fail to build, the names are kept all the same: the
     // panes are then slower to fill, never wrong.

@@ -42,7 +42,7 @@ public:
 
     // A file with more rejected names than this reports the first ones and
     // then, once, how many more were rejected.
-    static constexpr int MaxReportsPerFile = 10;
+    static constexpr int MaxReportsPerFile = MaxImportReportsPerFile;
 
 private:
     void addName(ListKind kind, const QString& location, const QString& prompt);

@@ -67,6 +67,11 @@ void refuseOverlong(const QString& text)
         text.left(QuotedLength), QString::number(NameSplitter::MaxNameLength)));
 }
 
+QString moreRejected(int count)
+{
+    return u"%1 more names of this file were not stored."_s.arg(count);
+}
+
 QString nameToStore(const QString& typed, const ListChoice& choice)
 {
     const QString name = QString(typed).remove(u'\'');
@@ -101,7 +106,8 @@ void NameFileImport::begin()
     try {
         // Room for the pages a large import touches.
         m_connection.execute("pragma cache_size = -65536");
-        m_transaction.emplace(m_connection);
+        if (!m_connection.inTransaction())
+            m_transaction.emplace(m_connection);
         if (m_file.size() >= BulkFileBytes)
             m_indexes = m_connection.dropPlainIndexes(insertTable(m_insert));
         m_prepared.emplace(m_connection, m_insert);
@@ -157,7 +163,7 @@ void NameFileImport::commit()
 {
     m_prepared.reset();
     if (!m_transaction)
-        throw Failure(u"The import has not begun."_s);
+        return;
     m_transaction->commit();
     m_transaction.reset();
 }

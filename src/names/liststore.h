@@ -40,9 +40,16 @@ const char* clearStatement(ListKind kind);
 // choice with no source selected. A name that is too long is refused.
 QString nameToStore(const QString& typed, const ListChoice& choice);
 
+// A file with more rejected names than this reports the first ones and
+// then, once, how many more were rejected (moreRejected).
+inline constexpr int MaxImportReportsPerFile = 10;
+QString moreRejected(int count);
+
 // One text file's names into one list, in one transaction: a statement that
 // fails changes nothing, and the names before it stay unless the caller
-// rolls back. Every step throws Failure.
+// rolls back. On a connection with a transaction already open, the import
+// joins it and leaves its end to the caller: several files then stand or
+// fall together. Every step throws Failure.
 class NameFileImport {
 public:
     NameFileImport(Connection& connection, const QString& path, const char* insert);
@@ -52,7 +59,7 @@ public:
 
     // Opens the file for reading; devices and pipes are refused.
     void openFile();
-    // Starts the transaction and prepares the insert. A start that fails
+    // Starts the transaction (or joins the open one) and prepares the insert. A start that fails
     // part way is undone: the table keeps its indexes.
     void begin();
     // Appends the names of the file's next piece; false once the end is
@@ -62,6 +69,7 @@ public:
     void store(const NameSplitter::Name& name);
     // Builds the indexes that a large file's import dropped.
     void rebuildIndexes();
+    // Both end the import's own transaction; a joined one stays open.
     void commit();
     // Undoes everything since begin().
     void rollback();

@@ -47,6 +47,13 @@ QString ResultsModel::lastName(int row) const
     return m_names.lastNames.at(m_names.rows[std::size_t(row)].last);
 }
 
+std::optional<IndexedNames> ResultsModel::indexedNames() const
+{
+    if (!m_editedFirstNames.isEmpty())
+        return std::nullopt;
+    return IndexedNames{m_names.firstNames, m_names.lastNames, m_names.rows};
+}
+
 int ResultsModel::rowCount(const QModelIndex& parent) const
 {
     return parent.isValid() ? 0 : rowCount();

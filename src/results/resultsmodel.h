@@ -29,6 +29,8 @@ public:
     int rowCount() const override { return int(m_names.rows.size()); }
     QString firstName(int row) const override;
     QString lastName(int row) const override;
+    // Until a first name is retyped.
+    std::optional<IndexedNames> indexedNames() const override;
 
     // The view's side. No default argument here: rowCount() alone is the
     // ResultRows count.

@@ -8,38 +8,26 @@
 #include <QStringEncoder>
 
 #include <algorithm>
+#include <cstring>
+#include <optional>
+#include <vector>
 
 using namespace Qt::StringLiterals;
 
 namespace {
 
-// Every row's bytes, in list order, in one buffer. Each name is encoded
-// straight into the end of the buffer: no text of the whole list is built
-// twice, and no small array is made per name. writeRow appends one row at
-// out, never more than room(first, last) bytes, and returns the new end.
-template <typename Room, typename WriteRow>
-QByteArray encodeRows(const ResultRows& rows, QByteArray bytes, Room room, WriteRow writeRow)
-{
-    QStringEncoder encoder(QStringEncoder::System, QStringEncoder::Flag::Stateless);
-    const int count = rows.rowCount();
-    qsizetype used = bytes.size();
-    bytes.resize(used + qsizetype(count) * 18);
-    for (int row = 0; row < count; ++row) {
-        const QString first = rows.firstName(row);
-        const QString last = rows.lastName(row);
-        const qsizetype most = room(encoder, first, last);
-        if (used + most > bytes.size())
-            bytes.resize(std::max(bytes.size() * 2, used + most));
-        char* out = writeRow(encoder, bytes.data() + used, first, last);
-        used = out - bytes.constData();
-    }
-    bytes.truncate(used);
-    return bytes;
-}
+// How a format lays out its rows: a header line, the field between the two
+// names, the line end, and a field's text from a name.
+struct RowLayout {
+    QByteArrayView header;
+    char separator;
+    QByteArrayView lineEnd;
+    QString (*field)(const QString& name);
+};
 
-qsizetype plainRoom(QStringEncoder& encoder, const QString& first, const QString& last)
+QString asItIs(const QString& name)
 {
-    return encoder.requiredSpace(first.size() + last.size()) + 3;
+    return name;
 }
 
 // A field as a CSV reader takes it back: quoted, with its quotes doubled,
@@ -52,51 +40,114 @@ QString csvField(const QString& name)
     return plain ? name : u'"' + QString(name).replace(u"\""_s, u"\"\""_s) + u'"';
 }
 
+// A table of names encoded once, one after another in one buffer.
+class EncodedTable {
+public:
+    EncodedTable(const QStringList& names, const RowLayout& layout, QStringEncoder& encoder)
+    {
+        m_ends.reserve(std::size_t(names.size()));
+        for (const QString& name : names) {
+            m_bytes += encoder.encode(layout.field(name));
+            m_ends.push_back(m_bytes.size());
+        }
+    }
+    QByteArrayView at(std::uint32_t index) const
+    {
+        const qsizetype begin = index == 0 ? 0 : m_ends[index - 1];
+        return QByteArrayView(m_bytes.constData() + begin, m_ends[index] - begin);
+    }
+
+private:
+    QByteArray m_bytes;
+    std::vector<qsizetype> m_ends;
+};
+
+// Appends bytes to a buffer that grows by doubling.
+class Output {
+public:
+    explicit Output(qsizetype expected) { m_bytes.resize(expected); }
+
+    // Room for at least most more bytes; returns where they go.
+    char* reserve(qsizetype most)
+    {
+        if (m_used + most > m_bytes.size())
+            m_bytes.resize(std::max(m_bytes.size() * 2, m_used + most));
+        return m_bytes.data() + m_used;
+    }
+    void advanceTo(const char* end) { m_used = end - m_bytes.constData(); }
+    void append(QByteArrayView bytes)
+    {
+        char* out = reserve(bytes.size());
+        std::memcpy(out, bytes.data(), std::size_t(bytes.size()));
+        m_used += bytes.size();
+    }
+    QByteArray take()
+    {
+        m_bytes.truncate(m_used);
+        return std::move(m_bytes);
+    }
+
+private:
+    QByteArray m_bytes;
+    qsizetype m_used = 0;
+};
+
+// Every row's bytes, in list order, in one buffer, in the system's
+// encoding. Rows kept as indices into tables of names have each distinct
+// name encoded once and copied from there; other rows are encoded name by
+// name, straight into the end of the buffer.
+QByteArray encodeRows(const ResultRows& rows, const RowLayout& layout)
+{
+    QStringEncoder encoder(QStringEncoder::System, QStringEncoder::Flag::Stateless);
+    const int count = rows.rowCount();
+    Output output(layout.header.size() + qsizetype(count) * 18);
+    output.append(layout.header);
+
+    if (const std::optional<IndexedNames> indexed = rows.indexedNames()) {
+        const EncodedTable firsts(indexed->firstNames, layout, encoder);
+        const EncodedTable lasts(indexed->lastNames, layout, encoder);
+        for (const NamePair& row : indexed->rows) {
+            const QByteArrayView first = firsts.at(row.first);
+            const QByteArrayView last = lasts.at(row.last);
+            char* out = output.reserve(first.size() + last.size() + 1 + layout.lineEnd.size());
+            out = std::copy(first.begin(), first.end(), out);
+            *out++ = layout.separator;
+            out = std::copy(last.begin(), last.end(), out);
+            out = std::copy(layout.lineEnd.begin(), layout.lineEnd.end(), out);
+            output.advanceTo(out);
+        }
+        return output.take();
+    }
+
+    for (int row = 0; row < count; ++row) {
+        const QString first = layout.field(rows.firstName(row));
+        const QString last = layout.field(rows.lastName(row));
+        char* out = output.reserve(encoder.requiredSpace(first.size() + last.size()) + 1
+                                   + layout.lineEnd.size());
+        out = encoder.appendToBuffer(out, first);
+        *out++ = layout.separator;
+        out = encoder.appendToBuffer(out, last);
+        out = std::copy(layout.lineEnd.begin(), layout.lineEnd.end(), out);
+        output.advanceTo(out);
+    }
+    return output.take();
+}
+
 } // namespace
 
 QByteArray resultsText(const ResultRows& rows)
 {
-    return encodeRows(
-        rows, {}, plainRoom,
-        [](QStringEncoder& encoder, char* out, const QString& first, const QString& last) {
-            out = encoder.appendToBuffer(out, first);
-            *out++ = ' ';
-            out = encoder.appendToBuffer(out, last);
-            *out++ = '\r';
-            *out++ = '\n';
-            return out;
-        });
+    return encodeRows(rows, {{}, ' ', "\r\n", asItIs});
 }
 
 QByteArray resultsLines(const ResultRows& rows)
 {
-    return encodeRows(
-        rows, {}, plainRoom,
-        [](QStringEncoder& encoder, char* out, const QString& first, const QString& last) {
-            out = encoder.appendToBuffer(out, first);
-            *out++ = ' ';
-            out = encoder.appendToBuffer(out, last);
-            *out++ = '\n';
-            return out;
-        });
+    return encodeRows(rows, {{}, ' ', "\n", asItIs});
 }
 
 QByteArray resultsCsv(const ResultRows& rows)
 {
-    const auto room = [](QStringEncoder& encoder, const QString& first, const QString& last) {
-        // Quoting at most doubles a field and adds two quotes to each.
-        return encoder.requiredSpace(2 * (first.size() + last.size())) + 7;
-    };
-    return encodeRows(
-        rows, QByteArray("first_name,last_name\r\n"), room,
-        [](QStringEncoder& encoder, char* out, const QString& first, const QString& last) {
-            out = encoder.appendToBuffer(out, csvField(first));
-            *out++ = ',';
-            out = encoder.appendToBuffer(out, csvField(last));
-            *out++ = '\r';
-            *out++ = '\n';
-            return out;
-        });
+    return encodeRows(rows, {"first_name,last_name\r\n", ',', "\r\n", csvField});
 }
 
 void WriteTextFile(const QByteArray& text, const QString& path)
