@@ -1,0 +1,601 @@
+#include "cli/companion.h"
+
+#include "app/clock.h"
+#include "app/failure.h"
+#include "app/pointer.h"
+#include "app/programfiles.h"
+#include "generate/generation.h"
+#include "generate/randomsource.h"
+#include "names/database.h"
+#include "names/liststore.h"
+#include "names/namelists.h"
+#include "results/resultsmodel.h"
+#include "results/spreadsheet.h"
+#include "results/textfile.h"
+
+#include <QCommandLineParser>
+#include <QDir>
+#include <QFileInfo>
+#include <QLocale>
+
+#include <cerrno>
+#include <cstring>
+#include <functional>
+#include <map>
+#include <optional>
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const QString Program = u"quillane-cli"_s;
+
+// A command line that cannot be run as written; command names the
+// subcommand whose help explains it, if any.
+struct UsageProblem {
+    QString message;
+    QString command;
+};
+
+[[noreturn]] void usage(const QString& message, const QString& command = {})
+{
+    throw UsageProblem{message, command};
+}
+
+const char GeneralHelp[] = R"(Usage: quillane-cli [--database FILE] COMMAND [OPTIONS]
+
+Random personal names from Quillane's names database, for scripts, builds
+and test data. The commands work on the same lists as the program's window.
+
+Commands:
+  generate   make random full names
+  names      print the first or the last names of a list
+  add        add names to a list
+  delete     delete names from the built-in list
+  clear      empty the first or the last names of your own list
+  import     add the names of text files, one per line, to a list
+
+Options:
+  --database FILE  the names database (default: names.mdb beside the program)
+  -h, --help       show this help
+  --version        show the version
+
+Run 'quillane-cli COMMAND --help' for the options of a command.
+)";
+
+const std::map<QString, const char*> CommandHelp = {
+    {u"generate"_s, R"(Usage: quillane-cli generate -n COUNT [OPTIONS]
+
+Makes COUNT random full names as the window's "Start Generating" does: for
+each, a last name and a first name drawn from the chosen list, with spaces
+removed and regular capitals.
+
+Options:
+  -n, --count COUNT    how many names, up to 1000000, in your number format
+  --list builtin|user  draw from the built-in list (default) or your own
+  --gender both|male|female
+                       the built-in first names to draw from (default: both)
+  --seed N             start the random source at N, a whole number from 0
+                       to 18446744073709551615: the same seed gives the same
+                       names (default: the time of day)
+  --format FORMAT      text   "First Last" and CR LF per name: the window's
+                              text file, byte for byte
+                       lines  "First Last" and LF per name
+                       csv    comma-separated, with the header line
+                              first_name,last_name
+                       xlsx2  a workbook, first and last names in columns A, B
+                       xlsx1  a workbook, full names in column A
+                       Without it: lines on standard output; with -o, csv or
+                       xlsx2 for a FILE ending in .csv or .xlsx, else text.
+  -o, --output FILE    write to FILE instead of standard output; an existing
+                       FILE is replaced only once the new one is complete
+  --database FILE      the names database
+)"},
+    {u"names"_s, R"(Usage: quillane-cli names first|last [OPTIONS]
+
+Prints the first or the last names of a list, one per line, as the window's
+panes show them.
+
+Options:
+  --list builtin|user  the built-in list (default) or your own
+  --gender both|male|female
+                       the built-in first names (default: both)
+  --database FILE      the names database
+)"},
+    {u"add"_s, R"(Usage: quillane-cli add first|last NAME... [OPTIONS]
+
+Adds names to a list as the window's "Add" buttons do: apostrophes are
+removed and a name keeps its spaces. First names added to the built-in list
+join its female names. All the names are added, or none.
+
+Options:
+  --list builtin|user  the built-in list (default) or your own
+  --database FILE      the names database
+)"},
+    {u"delete"_s, R"(Usage: quillane-cli delete first|last NAME... [OPTIONS]
+
+Deletes names from the built-in list as the window's "Delete" buttons do.
+A first name leaves the male names, the female names or both, as --gender
+says. Capitals do not matter. A name that is not in the list is an error,
+and then nothing is deleted. Your own list is emptied as a whole with
+'quillane-cli clear'.
+
+Options:
+  --gender both|male|female
+                       which built-in first names to delete from
+                       (default: both)
+  --database FILE      the names database
+)"},
+    {u"clear"_s, R"(Usage: quillane-cli clear first|last [OPTIONS]
+
+Deletes every first name or every last name of your own list, as the
+window's "Clear" buttons do.
+
+Options:
+  --database FILE      the names database
+)"},
+    {u"import"_s, R"(Usage: quillane-cli import first|last FILE... [OPTIONS]
+
+Adds the names of text files to a list as the window's "Load ... From File"
+buttons do: one name per line, in UTF-8 (or UTF-16 or UTF-32 with a
+byte-order mark), apostrophes removed, empty lines skipped. A name longer
+than 255 characters is refused; then, or on any other failure, nothing of
+any file is imported.
+
+Options:
+  --list builtin|user  the built-in list (default) or your own
+  --database FILE      the names database
+)"},
+};
+
+// An output format of generate.
+enum class Format { Text, Lines, Csv, Workbook2, Workbook1 };
+
+const std::map<QString, Format> Formats = {
+    {u"text"_s, Format::Text},       {u"lines"_s, Format::Lines},     {u"csv"_s, Format::Csv},
+    {u"xlsx2"_s, Format::Workbook2}, {u"xlsx1"_s, Format::Workbook1},
+};
+
+// Long operations show no pointer here.
+class NoPointer : public PointerOwner {
+public:
+    int mousePointer() const override { return MousePointer::Default; }
+    void setMousePointer(int) override {}
+};
+
+class Command {
+public:
+    Command(QString name, const QStringList& arguments, QString database, std::FILE* out)
+        : m_name(std::move(name))
+        , m_arguments(arguments)
+        , m_database(std::move(database))
+        , m_out(out)
+    {
+    }
+
+    int run()
+    {
+        if (m_name == u"generate")
+            return generate();
+        if (m_name == u"names")
+            return names();
+        if (m_name == u"add")
+            return add();
+        if (m_name == u"delete")
+            return remove();
+        if (m_name == u"clear")
+            return clear();
+        if (m_name == u"import")
+            return import();
+        usage(u"'%1' is not a command."_s.arg(m_name));
+    }
+
+private:
+    // The options every command takes, then the command's own.
+    void parse(const QList<QCommandLineOption>& options, int leastPositional, int mostPositional)
+    {
+        m_parser.addOptions(options);
+        m_parser.addOption({u"database"_s, {}, u"FILE"_s});
+        m_parser.addOption({{u"h"_s, u"help"_s}, {}});
+        m_parser.setSingleDashWordOptionMode(QCommandLineParser::ParseAsCompactedShortOptions);
+        if (!m_parser.parse(QStringList{Program} + m_arguments))
+            usage(m_parser.errorText(), m_name);
+        if (m_parser.isSet(u"help"_s)) {
+            m_helpShown = true;
+            return;
+        }
+        if (m_parser.isSet(u"database"_s))
+            m_database = m_parser.value(u"database"_s);
+        const qsizetype count = m_parser.positionalArguments().size();
+        if (count < leastPositional)
+            usage(u"Too few arguments."_s, m_name);
+        if (mostPositional >= 0 && count > mostPositional)
+            usage(u"Unexpected argument '%1'."_s.arg(m_parser.positionalArguments().at(count - 1)),
+                  m_name);
+    }
+
+    bool helpShown()
+    {
+        if (m_helpShown)
+            write(QByteArray(CommandHelp.at(m_name)));
+        return m_helpShown;
+    }
+
+    ListKind kind() const
+    {
+        const QString word = m_parser.positionalArguments().value(0);
+        if (word == u"first")
+            return ListKind::FirstNames;
+        if (word == u"last")
+            return ListKind::LastNames;
+        usage(u"Say 'first' or 'last', not '%1'."_s.arg(word), m_name);
+    }
+
+    // The list options as the window's option buttons would be set.
+    ListChoice choice(bool listOption, bool genderOption) const
+    {
+        ListChoice choice;
+        const QString list = listOption ? m_parser.value(u"list"_s) : u"builtin"_s;
+        if (list == u"user") {
+            choice.builtIn = false;
+            choice.user = true;
+        } else if (list != u"builtin") {
+            usage(u"--list is 'builtin' or 'user', not '%1'."_s.arg(list), m_name);
+        }
+        if (genderOption && m_parser.isSet(u"gender"_s)) {
+            if (choice.user)
+                usage(u"--gender chooses among the built-in first names; your own list has "
+                      u"no genders."_s,
+                      m_name);
+            const QString gender = m_parser.value(u"gender"_s);
+            choice.both = gender == u"both";
+            choice.male = gender == u"male";
+            choice.female = gender == u"female";
+            if (!choice.both && !choice.male && !choice.female)
+                usage(u"--gender is 'both', 'male' or 'female', not '%1'."_s.arg(gender), m_name);
+        }
+        return choice;
+    }
+
+    static QCommandLineOption listOption() { return {u"list"_s, {}, u"LIST"_s, u"builtin"_s}; }
+    static QCommandLineOption genderOption() { return {u"gender"_s, {}, u"GENDER"_s, u"both"_s}; }
+
+    // Runs work against the names database; its failures name the file.
+    void withDatabase(const std::function<void()>& work) const
+    {
+        try {
+            work();
+        } catch (const Failure& failure) {
+            throw Failure(
+                u"%1: %2"_s.arg(QDir::toNativeSeparators(m_database), failure.description()));
+        }
+    }
+
+    // Both panes for the choice, filled as the window fills them.
+    void fillPanes(NameLists& lists, const ListChoice& choice) const
+    {
+        withDatabase([&] { lists.RefreshLists(choice); });
+    }
+
+    void write(const QByteArray& bytes) const
+    {
+        if (std::fwrite(bytes.constData(), 1, std::size_t(bytes.size()), m_out)
+                != std::size_t(bytes.size())
+            || std::fflush(m_out) != 0)
+            throw Failure(
+                u"standard output: %1"_s.arg(QString::fromLocal8Bit(std::strerror(errno))));
+    }
+
+    int generate();
+    int names();
+    int add();
+    int remove();
+    int clear();
+    int import();
+
+    QString m_name;
+    QStringList m_arguments;
+    QString m_database;
+    std::FILE* m_out;
+    QCommandLineParser m_parser;
+    bool m_helpShown = false;
+};
+
+int Command::generate()
+{
+    parse({{{u"n"_s, u"count"_s}, {}, u"COUNT"_s},
+           listOption(),
+           genderOption(),
+           {u"seed"_s, {}, u"N"_s},
+           {u"format"_s, {}, u"FORMAT"_s},
+           {{u"o"_s, u"output"_s}, {}, u"FILE"_s}},
+          0, 0);
+    if (helpShown())
+        return Companion::Done;
+
+    // The count is read and bounded as the window reads its count box.
+    if (!m_parser.isSet(u"count"_s))
+        usage(u"How many? Give -n COUNT."_s, m_name);
+    const CountText count(m_parser.value(u"count"_s), QLocale::system());
+    if (!count.isNumber())
+        usage(GenerationMessages::NotANumber, m_name);
+    if (count.tooMany())
+        usage(GenerationMessages::TooMany, m_name);
+    const ListChoice list = choice(true, true);
+
+    std::optional<std::uint64_t> seed;
+    if (m_parser.isSet(u"seed"_s)) {
+        bool ok = false;
+        const QString text = m_parser.value(u"seed"_s);
+        const qulonglong value = text.toULongLong(&ok);
+        if (!ok || text.startsWith(u'-') || text.startsWith(u'+'))
+            usage(u"--seed takes a whole number from 0 to 18446744073709551615, not '%1'."_s.arg(
+                      text),
+                  m_name);
+        seed = value;
+    }
+
+    QString output = m_parser.value(u"output"_s);
+    if (output == u"-")
+        output.clear();
+    Format format = Format::Lines;
+    if (m_parser.isSet(u"format"_s)) {
+        const auto found = Formats.find(m_parser.value(u"format"_s));
+        if (found == Formats.end())
+            usage(u"--format is text, lines, csv, xlsx2 or xlsx1, not '%1'."_s.arg(
+                      m_parser.value(u"format"_s)),
+                  m_name);
+        format = found->second;
+    } else if (!output.isEmpty()) {
+        format = output.endsWith(u".csv"_s, Qt::CaseInsensitive)    ? Format::Csv
+                 : output.endsWith(u".xlsx"_s, Qt::CaseInsensitive) ? Format::Workbook2
+                                                                    : Format::Text;
+    }
+    const bool workbook = format == Format::Workbook2 || format == Format::Workbook1;
+    if (workbook && output.isEmpty())
+        usage(u"A workbook is written to a file: give -o FILE."_s, m_name);
+
+    NoPointer pointer;
+    NameLists lists(m_database, pointer);
+    fillPanes(lists, list);
+    const QString refusal =
+        refusalBeforeStart(count, lists.firstPane().count(), lists.lastPane().count());
+    if (!refusal.isEmpty())
+        throw Failure(refusal);
+
+    RandomSource random;
+    if (seed)
+        random.seed(*seed);
+    else
+        random.seedFromTimeOfDay(SystemClock().secondsSinceMidnight());
+    NameGenerator generator(lists.firstPane().names(), lists.lastPane().names(), random);
+    ResultsModel rows;
+    rows.setRows(generator.generate(count.count()));
+
+    if (workbook) {
+        const QString path = QFileInfo(output).absoluteFilePath();
+        WorkbookFile book(QFileInfo(path).absolutePath());
+        fillSheet(book.sheet(),
+                  format == Format::Workbook2 ? OutputChoice::SpreadsheetTwoCells
+                                              : OutputChoice::SpreadsheetOneCell,
+                  rows);
+        book.close();
+        book.moveTo(path, true);
+        return Companion::Done;
+    }
+    const QByteArray bytes = format == Format::Text  ? resultsText(rows)
+                             : format == Format::Csv ? resultsCsv(rows)
+                                                     : resultsLines(rows);
+    if (output.isEmpty())
+        write(bytes);
+    else
+        WriteTextFile(bytes, output);
+    return Companion::Done;
+}
+
+int Command::names()
+{
+    parse({listOption(), genderOption()}, 1, 1);
+    if (helpShown())
+        return Companion::Done;
+    const ListKind which = kind();
+    const ListChoice list = choice(true, true);
+    NoPointer pointer;
+    NameLists lists(m_database, pointer);
+    fillPanes(lists, list);
+    const PaneModel& pane = which == ListKind::FirstNames ? lists.firstPane() : lists.lastPane();
+    QByteArray bytes;
+    for (const QString& name : pane.names()) {
+        bytes += name.toUtf8();
+        bytes += '\n';
+    }
+    write(bytes);
+    return Companion::Done;
+}
+
+int Command::add()
+{
+    parse({listOption()}, 2, -1);
+    if (helpShown())
+        return Companion::Done;
+    const ListKind which = kind();
+    const ListChoice list = choice(true, false);
+    // Every name is checked before the database is touched.
+    QStringList stored;
+    for (const QString& typed : m_parser.positionalArguments().mid(1)) {
+        const QString name = nameToStore(typed, list);
+        if (name.isEmpty())
+            throw Failure(u"The name \"%1\" is blank: nothing was added."_s.arg(typed));
+        stored.append(name);
+    }
+    withDatabase([&] {
+        Connection connection(m_database);
+        Connection::Transaction transaction(connection);
+        try {
+            for (const QString& name : std::as_const(stored))
+                connection.execute(insertStatement(which, list), name);
+        } catch (...) {
+            transaction.rollback();
+            throw;
+        }
+        transaction.commit();
+    });
+    return Companion::Done;
+}
+
+int Command::remove()
+{
+    parse({listOption(), genderOption()}, 2, -1);
+    if (helpShown())
+        return Companion::Done;
+    const ListKind which = kind();
+    const ListChoice list = choice(true, true);
+    if (list.user)
+        usage(u"Your own list is emptied as a whole: use 'quillane-cli clear'."_s, m_name);
+    withDatabase([&] {
+        Connection connection(m_database);
+        Connection::Transaction transaction(connection);
+        try {
+            for (const QString& name : m_parser.positionalArguments().mid(1)) {
+                int deleted = 0;
+                for (const char* sql : builtInDeletes(which, list)) {
+                    connection.execute(sql, name);
+                    deleted += connection.changes();
+                }
+                if (deleted == 0)
+                    throw Failure(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
+            }
+        } catch (...) {
+            transaction.rollback();
+            throw;
+        }
+        transaction.commit();
+    });
+    return Companion::Done;
+}
+
+int Command::clear()
+{
+    parse({}, 1, 1);
+    if (helpShown())
+        return Companion::Done;
+    const ListKind which = kind();
+    withDatabase([&] {
+        Connection connection(m_database);
+        connection.execute(clearStatement(which));
+    });
+    return Companion::Done;
+}
+
+int Command::import()
+{
+    parse({listOption()}, 2, -1);
+    if (helpShown())
+        return Companion::Done;
+    const ListKind which = kind();
+    const ListChoice list = choice(true, false);
+    const QStringList paths = m_parser.positionalArguments().mid(1);
+    for (const QString& path : paths) {
+        if (!FileExists(path))
+            throw Failure(u"File not found: %1"_s.arg(path));
+    }
+
+    // The files stand or fall together: one transaction holds them all.
+    QStringList reports;
+    withDatabase([&] {
+        Connection connection(m_database);
+        Connection::Transaction transaction(connection);
+        try {
+            for (const QString& path : paths) {
+                NameFileImport import(connection, path, insertStatement(which, list));
+                int rejected = 0;
+                const auto report = [&](const QString& text) {
+                    if (++rejected <= MaxImportReportsPerFile)
+                        reports.append(u"%1: %2"_s.arg(path, text));
+                };
+                try {
+                    import.openFile();
+                    import.begin();
+                } catch (const Failure& failure) {
+                    throw Failure(u"%1: %2"_s.arg(path, failure.description()));
+                }
+                std::vector<NameSplitter::Name> names;
+                bool reading = true;
+                while (reading) {
+                    names.clear();
+                    reading = import.readNames(names);
+                    for (const NameSplitter::Name& name : names) {
+                        try {
+                            import.store(name);
+                        } catch (const Failure& failure) {
+                            report(failure.description());
+                        }
+                    }
+                }
+                if (rejected > MaxImportReportsPerFile)
+                    reports.append(
+                        u"%1: %2"_s.arg(path, moreRejected(rejected - MaxImportReportsPerFile)));
+                import.rebuildIndexes();
+            }
+            if (!reports.isEmpty())
+                throw Failure(reports.join(u"\n"_s) + u"\nNothing was imported."_s);
+        } catch (...) {
+            transaction.rollback();
+            throw;
+        }
+        transaction.commit();
+    });
+    return Companion::Done;
+}
+
+} // namespace
+
+namespace Companion {
+
+int run(const QStringList& arguments, const QString& programFolder, std::FILE* out, std::FILE* err)
+{
+    const auto complain = [err](const QString& message) {
+        std::fputs(qUtf8Printable(Program + u": "_s + message + u'\n'), err);
+    };
+    QString database = namesDatabasePath(programFolder);
+    try {
+        // The options before the command, then the command and its own.
+        qsizetype at = 1;
+        for (; at < arguments.size() && arguments.at(at).startsWith(u'-'); ++at) {
+            const QString& option = arguments.at(at);
+            if (option == u"-h" || option == u"--help") {
+                std::fputs(GeneralHelp, out);
+                return Done;
+            }
+            if (option == u"--version") {
+                std::fputs(
+                    qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'), out);
+                return Done;
+            }
+            if (option == u"--database" && at + 1 < arguments.size())
+                database = arguments.at(++at);
+            else if (option.startsWith(u"--database="))
+                database = option.section(u'=', 1);
+            else
+                usage(u"Unknown option '%1'."_s.arg(option));
+        }
+        if (at == arguments.size())
+            usage(u"Give a command."_s);
+        const QString name = arguments.at(at);
+        if (!CommandHelp.contains(name))
+            usage(u"'%1' is not a command."_s.arg(name));
+        Command command(name, arguments.mid(at + 1), database, out);
+        return command.run();
+    } catch (const UsageProblem& problem) {
+        complain(problem.message);
+        std::fputs(qUtf8Printable(u"Try '%1 %2--help'.\n"_s.arg(
+                       Program, problem.command.isEmpty() ? QString() : problem.command + u' ')),
+                   err);
+        return UsageError;
+    } catch (...) {
+        complain(describeCurrentException());
+        return Failed;
+    }
+}
+
+} // namespace Companion
