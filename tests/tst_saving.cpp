@@ -3,9 +3,12 @@
 // when something fails.
 #include "app/errorreport.h"
 #include "results/resultrows.h"
+#include "results/resultsmodel.h"
 #include "results/resultssaver.h"
+#include "results/textfile.h"
 #include "support/fakedialogs.h"
 #include "support/fakeplatform.h"
+#include "support/workbook.h"
 
 #include <QDir>
 #include <QFile>
@@ -45,22 +48,6 @@ QByteArray readAll(const QString& path)
 QStringList entries(const QString& folder)
 {
     return QDir(folder).entryList(QDir::AllEntries | QDir::Hidden | QDir::NoDotAndDotDot);
-}
-
-// Every filled cell of every sheet as openpyxl reads it, "A1 value" joined
-// by commas, with the cell's type after the value when it is not text.
-QString readWorkbook(const QString& path)
-{
-    QProcess python;
-    python.setProcessChannelMode(QProcess::ForwardedErrorChannel);
-    python.start(u"/usr/bin/python3"_s, {u"-c"_s, uR"py(import sys, openpyxl
-sys.stdout.reconfigure(encoding="utf-8")
-print(",".join(f"{c.coordinate} {c.value}" + ("" if c.data_type == "s" else f" ({c.data_type})")
-    for s in openpyxl.load_workbook(sys.argv[1]).worksheets for r in s.iter_rows() for c in r
-    if c.value is not None)))py"_s,
-                                         path});
-    python.waitForFinished(60000);
-    return QString::fromUtf8(python.readAllStandardOutput()).trimmed();
 }
 
 // The one message shown is this button's error report for the step at line
@@ -138,6 +125,42 @@ private Q_SLOTS:
         QCOMPARE(readAll(old.fileName()), answer == u"old.txt"_s ? bytes : QByteArray("old"));
         // The save dialog, and nothing after it but a failure's report.
         QCOMPARE(dialogs.shown.size(), fails ? 2 : 1);
+    }
+
+    // Rows kept as indices into tables are written from names encoded once
+    // per table; other rows name by name. Both give the same bytes in every
+    // layout, quoting included.
+    void layoutsOfTheRows_data()
+    {
+        QTest::addColumn<QByteArray (*)(const ResultRows&)>("layout");
+        QTest::addColumn<QByteArray>("bytes");
+        QTest::newRow("text")
+            << &resultsText << u"Zoë Lee\r\nAnn \"Jr\"\r\nZoë \"Jr\"\r\nAnn, B Lee\r\n"_s.toUtf8();
+        QTest::newRow("lines") << &resultsLines
+                               << u"Zoë Lee\nAnn \"Jr\"\nZoë \"Jr\"\nAnn, B Lee\n"_s.toUtf8();
+        QTest::newRow("csv") << &resultsCsv
+                             << u"first_name,last_name\r\nZoë,Lee\r\nAnn,\"\"\"Jr\"\"\"\r\n"
+                                u"Zoë,\"\"\"Jr\"\"\"\r\n\"Ann, B\",Lee\r\n"_s.toUtf8();
+    }
+
+    void layoutsOfTheRows()
+    {
+        using Layout = QByteArray (*)(const ResultRows&);
+        QFETCH(Layout, layout);
+        QFETCH(QByteArray, bytes);
+        GeneratedNames generated;
+        generated.firstNames = QStringList{u"Zoë"_s, u"Ann"_s, u"Ann, B"_s};
+        generated.lastNames = QStringList{u"Lee"_s, u"\"Jr\""_s};
+        generated.rows = {{0, 0}, {1, 1}, {0, 1}, {2, 0}};
+        ResultsModel indexed;
+        indexed.setRows(generated);
+        QVERIFY(indexed.indexedNames());
+        QCOMPARE(layout(indexed), bytes);
+        const Names byName{{u"Zoë"_s, u"Lee"_s},
+                           {u"Ann"_s, u"\"Jr\""_s},
+                           {u"Zoë"_s, u"\"Jr\""_s},
+                           {u"Ann, B"_s, u"Lee"_s}};
+        QCOMPARE(layout(ListRows(byName)), bytes);
     }
 
     void workbook_data()

@@ -42,6 +42,13 @@ struct UsageProblem {
     throw UsageProblem{message, command};
 }
 
+// A failure whose text says all there is to say: it names its own file, or
+// is about the command's input rather than the database it runs against.
+class Refusal : public Failure {
+public:
+    using Failure::Failure;
+};
+
 const char GeneralHelp[] = R"(Usage: quillane-cli [--database FILE] COMMAND [OPTIONS]
 
 Random personal names from Quillane's names database, for scripts, builds
@@ -265,6 +272,8 @@ private:
     {
         try {
             work();
+        } catch (const Refusal&) {
+            throw;
         } catch (const Failure& failure) {
             throw Failure(
                 u"%1: %2"_s.arg(QDir::toNativeSeparators(m_database), failure.description()));
@@ -463,7 +472,7 @@ int Command::remove()
                     deleted += connection.changes();
                 }
                 if (deleted == 0)
-                    throw Failure(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
+                    throw Refusal(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
             }
         } catch (...) {
             transaction.rollback();
@@ -517,7 +526,7 @@ int Command::import()
                     import.openFile();
                     import.begin();
                 } catch (const Failure& failure) {
-                    throw Failure(u"%1: %2"_s.arg(path, failure.description()));
+                    throw Refusal(u"%1: %2"_s.arg(path, failure.description()));
                 }
                 std::vector<NameSplitter::Name> names;
                 bool reading = true;
@@ -538,7 +547,7 @@ int Command::import()
                 import.rebuildIndexes();
             }
             if (!reports.isEmpty())
-                throw Failure(reports.join(u"\n"_s) + u"\nNothing was imported."_s);
+                throw Refusal(reports.join(u"\n"_s) + u"\nNothing was imported."_s);
         } catch (...) {
             transaction.rollback();
             throw;
@@ -554,8 +563,11 @@ namespace Companion {
 
 int run(const QStringList& arguments, const QString& programFolder, std::FILE* out, std::FILE* err)
 {
+    // Every line of a complaint names the program, as a script's log
+    // shows it among other programs' lines.
     const auto complain = [err](const QString& message) {
-        std::fputs(qUtf8Printable(Program + u": "_s + message + u'\n'), err);
+        for (const QString& line : message.split(u'\n'))
+            std::fputs(qUtf8Printable(Program + u": "_s + line + u'\n'), err);
     };
     QString database = namesDatabasePath(programFolder);
     try {
