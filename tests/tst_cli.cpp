@@ -119,6 +119,9 @@ private Q_SLOTS:
         QTest::newRow("delete from the user list")
             << QStringList{u"delete"_s, u"first"_s, u"Ann"_s, u"--list"_s, u"user"_s} << 2
             << u"quillane-cli: Your own list is emptied as a whole: use 'quillane-cli clear'."_s;
+        QTest::newRow("output over the database")
+            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"-o"_s, u"%1/./names.mdb"_s} << 2
+            << u"quillane-cli: -o %1/./names.mdb would replace the names database."_s;
         QTest::newRow("empty user list")
             << QStringList{u"generate"_s, u"-n"_s, u"3"_s,         u"--list"_s,
                            u"user"_s,     u"-o"_s, u"%1/out.txt"_s}

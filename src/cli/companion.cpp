@@ -360,6 +360,11 @@ int Command::generate()
                  : output.endsWith(u".xlsx"_s, Qt::CaseInsensitive) ? Format::Workbook2
                                                                     : Format::Text;
     }
+    // The one file whose loss a typing slip must never cause.
+    if (!output.isEmpty()
+        && QFileInfo(output).canonicalFilePath() == QFileInfo(m_database).canonicalFilePath()
+        && QFileInfo::exists(output))
+        usage(u"-o %1 would replace the names database."_s.arg(output), m_name);
     const bool workbook = format == Format::Workbook2 || format == Format::Workbook1;
     if (workbook && output.isEmpty())
         usage(u"A workbook is written to a file: give -o FILE."_s, m_name);
