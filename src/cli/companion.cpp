@@ -238,18 +238,19 @@ private:
         usage(u"Say 'first' or 'last', not '%1'."_s.arg(word), m_name);
     }
 
-    // The list options as the window's option buttons would be set.
-    ListChoice choice(bool listOption, bool genderOption) const
+    // The --list (and --gender) options as the window's option buttons
+    // would be set.
+    ListChoice choice(bool takesGender) const
     {
         ListChoice choice;
-        const QString list = listOption ? m_parser.value(u"list"_s) : u"builtin"_s;
+        const QString list = m_parser.value(u"list"_s);
         if (list == u"user") {
             choice.builtIn = false;
             choice.user = true;
         } else if (list != u"builtin") {
             usage(u"--list is 'builtin' or 'user', not '%1'."_s.arg(list), m_name);
         }
-        if (genderOption && m_parser.isSet(u"gender"_s)) {
+        if (takesGender && m_parser.isSet(u"gender"_s)) {
             if (choice.user)
                 usage(u"--gender chooses among the built-in first names; your own list has "
                       u"no genders."_s,
@@ -330,7 +331,7 @@ int Command::generate()
         usage(GenerationMessages::NotANumber, m_name);
     if (count.tooMany())
         usage(GenerationMessages::TooMany, m_name);
-    const ListChoice list = choice(true, true);
+    const ListChoice list = choice(true);
 
     std::optional<std::uint64_t> seed;
     if (m_parser.isSet(u"seed"_s)) {
@@ -413,7 +414,7 @@ int Command::names()
     if (helpShown())
         return Companion::Done;
     const ListKind which = kind();
-    const ListChoice list = choice(true, true);
+    const ListChoice list = choice(true);
     NoPointer pointer;
     NameLists lists(m_database, pointer);
     fillPanes(lists, list);
@@ -433,7 +434,7 @@ int Command::add()
     if (helpShown())
         return Companion::Done;
     const ListKind which = kind();
-    const ListChoice list = choice(true, false);
+    const ListChoice list = choice(false);
     // Every name is checked before the database is touched.
     QStringList stored;
     for (const QString& typed : m_parser.positionalArguments().mid(1)) {
@@ -463,7 +464,7 @@ int Command::remove()
     if (helpShown())
         return Companion::Done;
     const ListKind which = kind();
-    const ListChoice list = choice(true, true);
+    const ListChoice list = choice(true);
     if (list.user)
         usage(u"Your own list is emptied as a whole: use 'quillane-cli clear'."_s, m_name);
     withDatabase([&] {
@@ -507,7 +508,7 @@ int Command::import()
     if (helpShown())
         return Companion::Done;
     const ListKind which = kind();
-    const ListChoice list = choice(true, false);
+    const ListChoice list = choice(false);
     const QStringList paths = m_parser.positionalArguments().mid(1);
     for (const QString& path : paths) {
         if (!FileExists(path))
