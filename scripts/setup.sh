@@ -24,6 +24,8 @@ packages=(
     fonts-liberation2 xdg-utils
     # for the headless tests and the reading back of saved workbooks
     xvfb xauth dbus python3-openpyxl
+    # for checking the installed menu entry
+    desktop-file-utils
     # for scripts/fuzz.sh (libFuzzer)
     clang libclang-rt-14-dev
 )
