@@ -92,7 +92,7 @@ click() {
 save() {
     local id=$1 name=$2
     sleep 0.5
-    import -window "$id" "png:$WORK/$name"
+    /usr/bin/import -window "$id" "png:$WORK/$name"
     /usr/bin/convert "$WORK/$name" -strip +dither -colors 256 -define png:compression-level=9 \
         "PNG8:$OUT/$name"
 }
@@ -123,8 +123,9 @@ results=$(window Preview)
 save "$results" results-window.png
 stop
 
-# The list locked by another program after the window has opened:
-# "Add First Name" waits out the busy timeout and then reports the failure.
+# The list locked by another program once the window is open (the program
+# reads the lists as it starts and would end there): "Add First Name" waits
+# out the busy timeout and then reports the failure.
 start
 /usr/bin/python3 -c '
 import sqlite3, sys, time
@@ -146,7 +147,7 @@ sleep 0.5
 eval "$(xdotool getwindowgeometry --shell "$report" | grep -E '^(X|Y|WIDTH|HEIGHT)=')"
 box_left=$X box_top=$Y box_right=$((X + WIDTH - 1)) box_bottom=$((Y + HEIGHT - 1))
 eval "$(xdotool getwindowgeometry --shell "$main" | grep -E '^(X|Y|WIDTH|HEIGHT)=')"
-import -window root "png:$WORK/screen.png"
+/usr/bin/import -window root "png:$WORK/screen.png"
 /usr/bin/convert "$WORK/screen.png" -fill none -stroke '#404040' \
     -draw "rectangle $((box_left - 1)),$((box_top - 1)) $((box_right + 1)),$((box_bottom + 1))" \
     -crop "${WIDTH}x${HEIGHT}+${X}+${Y}" +repage \
