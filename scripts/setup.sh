@@ -4,6 +4,7 @@
 #
 #   scripts/setup.sh run     install what is missing, build, start the program
 #   scripts/setup.sh test    install what is missing, build, run all tests
+#   scripts/setup.sh build   install what is missing, build (for other scripts)
 #
 # Environment: BUILD_DIR (default: build), QUILLANE_WERROR=ON to fail on
 # warnings, QUILLANE_SANITIZE=ON for an AddressSanitizer/UBSan build.
@@ -11,11 +12,13 @@ set -euo pipefail
 
 mode=${1:-}
 case "$mode" in
-    run|test) ;;
-    *) echo "usage: $0 run|test" >&2; exit 2 ;;
+    run|test|build) ;;
+    *) echo "usage: $0 run|test|build" >&2; exit 2 ;;
 esac
 
 top=$(cd "$(dirname "$0")/.." && pwd)
+# shellcheck source=scripts/packages.sh
+. "$top/scripts/packages.sh"
 build=${BUILD_DIR:-$top/build}
 
 packages=(
@@ -24,21 +27,13 @@ packages=(
     fonts-liberation2 xdg-utils
     # for the headless tests and the reading back of saved workbooks
     xvfb xauth dbus python3-openpyxl
+    # for checking the installed menu entry
+    desktop-file-utils
     # for scripts/fuzz.sh (libFuzzer)
     clang libclang-rt-14-dev
 )
 
-missing=()
-for p in "${packages[@]}"; do
-    dpkg-query -W -f='${Status}' "$p" 2>/dev/null | grep -q 'install ok installed' || missing+=("$p")
-done
-if [ ${#missing[@]} -gt 0 ]; then
-    echo "Installing: ${missing[*]}"
-    sudo=""
-    [ "$(id -u)" -eq 0 ] || sudo="sudo"
-    $sudo apt-get update -qq
-    DEBIAN_FRONTEND=noninteractive $sudo apt-get install -y -qq --no-install-recommends "${missing[@]}"
-fi
+install_missing "${packages[@]}"
 
 cmake -S "$top" -B "$build" -G Ninja \
     -DCMAKE_BUILD_TYPE="${CMAKE_BUILD_TYPE:-Release}" \
@@ -46,9 +41,10 @@ cmake -S "$top" -B "$build" -G Ninja \
     -DQUILLANE_SANITIZE="${QUILLANE_SANITIZE:-OFF}"
 cmake --build "$build"
 
-if [ "$mode" = run ]; then
-    exec "$build/bin/quillane"
-fi
+case "$mode" in
+    run) exec "$build/bin/quillane" ;;
+    build) exit 0 ;;
+esac
 
 export QT_QPA_PLATFORM=offscreen
 ctest --test-dir "$build" --output-on-failure
