@@ -39,11 +39,14 @@ public:
 
 // In the child process, started as `<program> <option> <folder>`: the
 // program's application object, and an environment in that folder with
-// fake platform parts and printing dialogs.
+// fake platform parts and printing dialogs. The settings are kept in that
+// folder too, which the parent removes: the child may end without running
+// a destructor.
 struct ChildProgram {
     ChildProgram(int& argc, char** argv)
         : app(argc, argv)
-        , settings((useTemporarySettings(), std::make_unique<Settings>()))
+        , settings(
+              (useSettingsFolder(QString::fromLocal8Bit(argv[2])), std::make_unique<Settings>()))
         , environment{dialogs, *settings, shell, clock, random, QString::fromLocal8Bit(argv[2])}
     {
         app.setDialogs(&dialogs);

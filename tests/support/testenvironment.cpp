@@ -37,8 +37,13 @@ struct Db {
 
 void useTemporarySettings()
 {
-    QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, settingsFolder().path());
-    QFile::remove(settingsFolder().filePath(u"Varnholt.ini"_s));
+    useSettingsFolder(settingsFolder().path());
+}
+
+void useSettingsFolder(const QString& folder)
+{
+    QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, folder);
+    QFile::remove(QDir(folder).filePath(u"Varnholt.ini"_s));
 }
 
 TestEnvironment::TestEnvironment(bool shippedDatabase)

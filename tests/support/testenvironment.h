@@ -16,6 +16,8 @@
 // Points the settings store at a fresh temporary folder, so no test ever
 // touches the user's settings. Call before the first Settings is made.
 void useTemporarySettings();
+// Points the settings store at an empty settings file in folder.
+void useSettingsFolder(const QString& folder);
 
 // A program folder of its own for one test: a fresh copy of the shipped
 // names database, an empty settings store, scripted dialogs, a fake shell
