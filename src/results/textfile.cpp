@@ -8,7 +8,6 @@
 #include <QStringEncoder>
 
 #include <algorithm>
-#include <cstring>
 #include <optional>
 #include <vector>
 
@@ -78,8 +77,7 @@ public:
     void append(QByteArrayView bytes)
     {
         char* out = reserve(bytes.size());
-        std::memcpy(out, bytes.data(), std::size_t(bytes.size()));
-        m_used += bytes.size();
+        advanceTo(std::copy(bytes.begin(), bytes.end(), out));
     }
     QByteArray take()
     {
