@@ -553,7 +553,7 @@ int Command::import()
                 import.rebuildIndexes();
             }
             if (!reports.isEmpty())
-                throw Refusal(reports.join(u"\n"_s) + u"\nNothing was imported."_s);
+                throw Refusal(reports.join(u"\n"_s) + u" Nothing was imported."_s);
         } catch (...) {
             transaction.rollback();
             throw;
@@ -605,10 +605,10 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
         Command command(name, arguments.mid(at + 1), database, out);
         return command.run();
     } catch (const UsageProblem& problem) {
-        complain(problem.message);
-        std::fputs(qUtf8Printable(u"Try '%1 %2--help'.\n"_s.arg(
-                       Program, problem.command.isEmpty() ? QString() : problem.command + u' ')),
-                   err);
+        // One line, the way to the help included.
+        complain(u"%1 Try '%2 %3--help'."_s.arg(
+            problem.message, Program,
+            problem.command.isEmpty() ? QString() : problem.command + u' '));
         return UsageError;
     } catch (...) {
         complain(describeCurrentException());
