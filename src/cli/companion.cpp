@@ -198,8 +198,9 @@ public:
     }
 
 private:
-    // The options every command takes, then the command's own.
-    void parse(const QList<QCommandLineOption>& options, int leastPositional, int mostPositional)
+    // The options every command takes, then the command's own. False when
+    // the command's help was asked for: it is shown, and the command ends.
+    bool parse(const QList<QCommandLineOption>& options, int leastPositional, int mostPositional)
     {
         m_parser.addOptions(options);
         m_parser.addOption({u"database"_s, {}, u"FILE"_s});
@@ -208,8 +209,8 @@ private:
         if (!m_parser.parse(QStringList{Program} + m_arguments))
             usage(m_parser.errorText(), m_name);
         if (m_parser.isSet(u"help"_s)) {
-            m_helpShown = true;
-            return;
+            write(QByteArray(CommandHelp.at(m_name)));
+            return false;
         }
         if (m_parser.isSet(u"database"_s))
             m_database = m_parser.value(u"database"_s);
@@ -219,13 +220,7 @@ private:
         if (mostPositional >= 0 && count > mostPositional)
             usage(u"Unexpected argument '%1'."_s.arg(m_parser.positionalArguments().at(count - 1)),
                   m_name);
-    }
-
-    bool helpShown()
-    {
-        if (m_helpShown)
-            write(QByteArray(CommandHelp.at(m_name)));
-        return m_helpShown;
+        return true;
     }
 
     ListKind kind() const
@@ -281,6 +276,23 @@ private:
         }
     }
 
+    // Work over a connection of its own, in one transaction: all of it is
+    // stored, or after any failure none of it.
+    void inOneTransaction(const std::function<void(Connection&)>& work) const
+    {
+        withDatabase([&] {
+            Connection connection(m_database);
+            Connection::Transaction transaction(connection);
+            try {
+                work(connection);
+            } catch (...) {
+                transaction.rollback();
+                throw;
+            }
+            transaction.commit();
+        });
+    }
+
     // Both panes for the choice, filled as the window fills them.
     void fillPanes(NameLists& lists, const ListChoice& choice) const
     {
@@ -308,19 +320,17 @@ private:
     QString m_database;
     std::FILE* m_out;
     QCommandLineParser m_parser;
-    bool m_helpShown = false;
 };
 
 int Command::generate()
 {
-    parse({{{u"n"_s, u"count"_s}, {}, u"COUNT"_s},
-           listOption(),
-           genderOption(),
-           {u"seed"_s, {}, u"N"_s},
-           {u"format"_s, {}, u"FORMAT"_s},
-           {{u"o"_s, u"output"_s}, {}, u"FILE"_s}},
-          0, 0);
-    if (helpShown())
+    if (!parse({{{u"n"_s, u"count"_s}, {}, u"COUNT"_s},
+                listOption(),
+                genderOption(),
+                {u"seed"_s, {}, u"N"_s},
+                {u"format"_s, {}, u"FORMAT"_s},
+                {{u"o"_s, u"output"_s}, {}, u"FILE"_s}},
+               0, 0))
         return Companion::Done;
 
     // The count is read and bounded as the window reads its count box.
@@ -410,8 +420,7 @@ int Command::generate()
 
 int Command::names()
 {
-    parse({listOption(), genderOption()}, 1, 1);
-    if (helpShown())
+    if (!parse({listOption(), genderOption()}, 1, 1))
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(true);
@@ -430,8 +439,7 @@ int Command::names()
 
 int Command::add()
 {
-    parse({listOption()}, 2, -1);
-    if (helpShown())
+    if (!parse({listOption()}, 2, -1))
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(false);
@@ -443,69 +451,47 @@ int Command::add()
             throw Failure(u"The name \"%1\" is blank: nothing was added."_s.arg(typed));
         stored.append(name);
     }
-    withDatabase([&] {
-        Connection connection(m_database);
-        Connection::Transaction transaction(connection);
-        try {
-            for (const QString& name : std::as_const(stored))
-                connection.execute(insertStatement(which, list), name);
-        } catch (...) {
-            transaction.rollback();
-            throw;
-        }
-        transaction.commit();
+    inOneTransaction([&](Connection& connection) {
+        for (const QString& name : std::as_const(stored))
+            connection.execute(insertStatement(which, list), name);
     });
     return Companion::Done;
 }
 
 int Command::remove()
 {
-    parse({listOption(), genderOption()}, 2, -1);
-    if (helpShown())
+    if (!parse({listOption(), genderOption()}, 2, -1))
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(true);
     if (list.user)
         usage(u"Your own list is emptied as a whole: use 'quillane-cli clear'."_s, m_name);
-    withDatabase([&] {
-        Connection connection(m_database);
-        Connection::Transaction transaction(connection);
-        try {
-            for (const QString& name : m_parser.positionalArguments().mid(1)) {
-                int deleted = 0;
-                for (const char* sql : builtInDeletes(which, list)) {
-                    connection.execute(sql, name);
-                    deleted += connection.changes();
-                }
-                if (deleted == 0)
-                    throw Refusal(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
+    inOneTransaction([&](Connection& connection) {
+        for (const QString& name : m_parser.positionalArguments().mid(1)) {
+            int deleted = 0;
+            for (const char* sql : builtInDeletes(which, list)) {
+                connection.execute(sql, name);
+                deleted += connection.changes();
             }
-        } catch (...) {
-            transaction.rollback();
-            throw;
+            if (deleted == 0)
+                throw Refusal(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
         }
-        transaction.commit();
     });
     return Companion::Done;
 }
 
 int Command::clear()
 {
-    parse({}, 1, 1);
-    if (helpShown())
+    if (!parse({}, 1, 1))
         return Companion::Done;
     const ListKind which = kind();
-    withDatabase([&] {
-        Connection connection(m_database);
-        connection.execute(clearStatement(which));
-    });
+    inOneTransaction([&](Connection& connection) { connection.execute(clearStatement(which)); });
     return Companion::Done;
 }
 
 int Command::import()
 {
-    parse({listOption()}, 2, -1);
-    if (helpShown())
+    if (!parse({listOption()}, 2, -1))
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(false);
@@ -516,49 +502,38 @@ int Command::import()
     }
 
     // The files stand or fall together: one transaction holds them all.
-    QStringList reports;
-    withDatabase([&] {
-        Connection connection(m_database);
-        Connection::Transaction transaction(connection);
-        try {
-            for (const QString& path : paths) {
-                NameFileImport import(connection, path, insertStatement(which, list));
-                int rejected = 0;
-                const auto report = [&](const QString& text) {
-                    if (++rejected <= MaxImportReportsPerFile)
-                        reports.append(u"%1: %2"_s.arg(path, text));
-                };
-                try {
-                    import.openFile();
-                    import.begin();
-                } catch (const Failure& failure) {
-                    throw Refusal(u"%1: %2"_s.arg(path, failure.description()));
-                }
-                std::vector<NameSplitter::Name> names;
-                bool reading = true;
-                while (reading) {
-                    names.clear();
-                    reading = import.readNames(names);
-                    for (const NameSplitter::Name& name : names) {
-                        try {
-                            import.store(name);
-                        } catch (const Failure& failure) {
-                            report(failure.description());
-                        }
+    inOneTransaction([&](Connection& connection) {
+        QStringList reports;
+        for (const QString& path : paths) {
+            NameFileImport import(connection, path, insertStatement(which, list));
+            try {
+                import.openFile();
+            } catch (const Failure& failure) {
+                throw Refusal(u"%1: %2"_s.arg(path, failure.description()));
+            }
+            import.begin();
+            int rejected = 0;
+            std::vector<NameSplitter::Name> names;
+            bool reading = true;
+            while (reading) {
+                names.clear();
+                reading = import.readNames(names);
+                for (const NameSplitter::Name& name : names) {
+                    try {
+                        import.store(name);
+                    } catch (const Failure& failure) {
+                        if (++rejected <= MaxImportReportsPerFile)
+                            reports.append(u"%1: %2"_s.arg(path, failure.description()));
                     }
                 }
-                if (rejected > MaxImportReportsPerFile)
-                    reports.append(
-                        u"%1: %2"_s.arg(path, moreRejected(rejected - MaxImportReportsPerFile)));
-                import.rebuildIndexes();
             }
-            if (!reports.isEmpty())
-                throw Refusal(reports.join(u"\n"_s) + u" Nothing was imported."_s);
-        } catch (...) {
-            transaction.rollback();
-            throw;
+            if (rejected > MaxImportReportsPerFile)
+                reports.append(
+                    u"%1: %2"_s.arg(path, moreRejected(rejected - MaxImportReportsPerFile)));
+            import.rebuildIndexes();
         }
-        transaction.commit();
+        if (!reports.isEmpty())
+            throw Refusal(reports.join(u"\n"_s) + u" Nothing was imported."_s);
     });
     return Companion::Done;
 }

@@ -32,6 +32,13 @@ const char* insertTable(const char* insert)
     return "user_lastname";
 }
 
+// Throws the report for a name longer than a list stores.
+[[noreturn]] void refuseOverlong(const QString& text)
+{
+    throw Failure(u"The name \"%1...\" is longer than %2 characters and was not stored."_s.arg(
+        text.left(QuotedLength), QString::number(NameSplitter::MaxNameLength)));
+}
+
 } // namespace
 
 const char* insertStatement(ListKind kind, const ListChoice& choice)
@@ -59,12 +66,6 @@ QList<const char*> builtInDeletes(ListKind kind, const ListChoice& choice)
 const char* clearStatement(ListKind kind)
 {
     return kind == ListKind::FirstNames ? Sql::ClearUserFirstNames : Sql::ClearUserLastNames;
-}
-
-void refuseOverlong(const QString& text)
-{
-    throw Failure(u"The name \"%1...\" is longer than %2 characters and was not stored."_s.arg(
-        text.left(QuotedLength), QString::number(NameSplitter::MaxNameLength)));
 }
 
 QString moreRejected(int count)

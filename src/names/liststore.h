@@ -32,9 +32,6 @@ QList<const char*> builtInDeletes(ListKind kind, const ListChoice& choice);
 // The statement that empties a user list ("Clear").
 const char* clearStatement(ListKind kind);
 
-// Throws the report for a name longer than a list stores.
-[[noreturn]] void refuseOverlong(const QString& text);
-
 // The name that a typed text stores: the text without its apostrophes.
 // Empty when nothing is to be stored: a text of nothing but blanks, or a
 // choice with no source selected. A name that is too long is refused.
