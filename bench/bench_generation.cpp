@@ -2,17 +2,17 @@
 // database with "Both" for 1,000,001 names, from the click to the results
 // window shown, with the process's peak memory before and after; and the bare
 // generator (draws, tidying, rows) without any window.
-#include "app/clock.h"
-#include "app/dialogs.h"
+#include "base/clock.h"
+#include "base/dialogs.h"
 #include "app/environment.h"
 #include "app/form1.h"
-#include "app/settings.h"
-#include "app/shell.h"
+#include "base/settings.h"
+#include "base/shell.h"
 #include "benchsupport.h"
 #include "generate/generation.h"
 #include "generate/randomsource.h"
 #include "names/namelists.h"
-#include "results/form2.h"
+#include "app/form2.h"
 
 #include <QApplication>
 #include <QElapsedTimer>

@@ -1,9 +1,9 @@
 // Times the import of a text file of a million first names into the user
 // list, then the refresh that shows them, and the import of one 200 MB line.
-#include "app/dialogs.h"
-#include "app/pointer.h"
+#include "base/dialogs.h"
+#include "base/pointer.h"
 #include "benchsupport.h"
-#include "names/listeditor.h"
+#include "app/listeditor.h"
 #include "names/namelists.h"
 
 #include <QCoreApplication>

@@ -1,6 +1,6 @@
 // Times RefreshLists: on the shipped database with "Both" chosen, and on a
 // user list of a million first and a million last names.
-#include "app/pointer.h"
+#include "base/pointer.h"
 #include "benchsupport.h"
 #include "names/namelists.h"
 

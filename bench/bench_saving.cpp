@@ -1,7 +1,7 @@
 // Times saving 1,000,001 results: the text file (building the text and
 // writing it), and the workbook (building and writing it, without starting
 // a spreadsheet program), with the growth of the peak memory it needs.
-#include "app/shell.h"
+#include "base/shell.h"
 #include "benchsupport.h"
 #include "results/resultrows.h"
 #include "results/spreadsheet.h"

@@ -4,9 +4,9 @@
 // copy of the shipped database, and the process's processor time and peak
 // memory.
 
-#include "app/dialogs.h"
-#include "app/pointer.h"
-#include "app/shell.h"
+#include "base/dialogs.h"
+#include "base/pointer.h"
+#include "base/shell.h"
 
 #include <QFile>
 #include <QTemporaryDir>

@@ -1,9 +1,9 @@
 #include "app/application.h"
-#include "app/clock.h"
+#include "base/clock.h"
 #include "app/environment.h"
 #include "app/qtdialogs.h"
-#include "app/settings.h"
-#include "app/shell.h"
+#include "base/settings.h"
+#include "base/shell.h"
 #include "generate/randomsource.h"
 
 int main(int argc, char** argv)

@@ -3,7 +3,7 @@
 // its standard output and error, the files it writes, and what a failed run
 // leaves behind.
 #include "names/database.h"
-#include "results/form2.h"
+#include "app/form2.h"
 #include "support/controls.h"
 #include "support/program.h"
 #include "support/workbook.h"

@@ -1,6 +1,6 @@
 // The names database: what each query shows in the panes, what the inserts
 // and deletes do, and how engine failures reach the caller.
-#include "app/failure.h"
+#include "base/failure.h"
 #include "names/database.h"
 #include "names/namelists.h"
 #include "support/fakepointer.h"

@@ -1,7 +1,7 @@
 // The error report and the trap that shows it.
-#include "app/errorreport.h"
-#include "app/failure.h"
-#include "app/trap.h"
+#include "base/errorreport.h"
+#include "base/failure.h"
+#include "base/trap.h"
 #include "names/namelists.h"
 #include "support/fakedialogs.h"
 #include "support/fakepointer.h"

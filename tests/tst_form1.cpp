@@ -1,7 +1,7 @@
 // The main window: start-up from the stored choices, the option clicks, the
 // panes, the count box, the "Help" message, and start-up with an unusable
 // database.
-#include "app/failure.h"
+#include "base/failure.h"
 #include "support/program.h"
 
 #include <QLineEdit>

@@ -1,7 +1,7 @@
 // "Start Generating" and the results window: the refusals as the user sees
 // them, the rows, the progress bar, "< Back", saving, and the window itself.
 #include "app/form1.h"
-#include "results/form2.h"
+#include "app/form2.h"
 #include "support/controls.h"
 #include "support/testenvironment.h"
 

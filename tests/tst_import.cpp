@@ -1,6 +1,6 @@
 // Importing names from text files: how a file's bytes become names, what
 // the user is told, and that no file, however strange, harms the database.
-#include "names/listeditor.h"
+#include "app/listeditor.h"
 #include "names/namelists.h"
 #include "names/namesplitter.h"
 #include "support/fakepointer.h"

@@ -1,10 +1,10 @@
 // Saving the results list: the text file's bytes and its safe replacement,
 // the workbook as an independent reader sees it, and the reports a user gets
 // when something fails.
-#include "app/errorreport.h"
+#include "base/errorreport.h"
 #include "results/resultrows.h"
 #include "results/resultsmodel.h"
-#include "results/resultssaver.h"
+#include "app/resultssaver.h"
 #include "results/textfile.h"
 #include "support/fakedialogs.h"
 #include "support/fakeplatform.h"

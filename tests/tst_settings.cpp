@@ -1,6 +1,6 @@
 // The settings store: the default rule, Booleans as the program reads them,
 // and writes that reach the file at once.
-#include "app/settings.h"
+#include "base/settings.h"
 #include "support/testenvironment.h"
 
 #include <QTest>

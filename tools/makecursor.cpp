@@ -3,7 +3,7 @@
 //
 //     makecursor <output.cur>
 
-#include "app/cursorfile.h"
+#include "base/cursorfile.h"
 
 #include <QImage>
 #include <QSaveFile>

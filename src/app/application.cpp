@@ -1,8 +1,8 @@
 #include "app/application.h"
 
-#include "app/dialogs.h"
+#include "base/dialogs.h"
 #include "app/environment.h"
-#include "app/failure.h"
+#include "base/failure.h"
 #include "app/form1.h"
 #include "app/programicon.h"
 

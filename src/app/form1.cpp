@@ -1,18 +1,18 @@
 #include "app/form1.h"
 
-#include "app/dialogs.h"
+#include "base/dialogs.h"
 #include "app/layout.h"
 #include "app/programicon.h"
 #include "app/randomvisit.h"
-#include "app/settings.h"
+#include "base/settings.h"
 #include "app/splash.h"
-#include "app/trap.h"
+#include "base/trap.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
 #include "generate/generation.h"
 #include "names/database.h"
-#include "results/form2.h"
+#include "app/form2.h"
 
 #include <QButtonGroup>
 #include <QCloseEvent>

@@ -17,9 +17,9 @@
 // draws from what they hold. Every setting is written the moment it changes.
 
 #include "app/environment.h"
-#include "app/pointer.h"
+#include "base/pointer.h"
 #include "names/listchoice.h"
-#include "names/listeditor.h"
+#include "app/listeditor.h"
 #include "names/namelists.h"
 
 #include <QWidget>

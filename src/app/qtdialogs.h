@@ -1,6 +1,6 @@
 #pragma once
 
-#include "app/dialogs.h"
+#include "base/dialogs.h"
 
 // The real dialogs, modal over the program's active window.
 class QtDialogs : public Dialogs {

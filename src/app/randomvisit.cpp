@@ -1,7 +1,7 @@
 #include "app/randomvisit.h"
 
-#include "app/clock.h"
-#include "app/shell.h"
+#include "base/clock.h"
+#include "base/shell.h"
 #include "generate/randomsource.h"
 
 #include <cmath>

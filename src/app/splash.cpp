@@ -1,8 +1,8 @@
 #include "app/splash.h"
 
-#include "app/clock.h"
-#include "app/dialogs.h"
-#include "app/settings.h"
+#include "base/clock.h"
+#include "base/dialogs.h"
+#include "base/settings.h"
 #include "app/twips.h"
 #include "app/windowroutines.h"
 

@@ -1,6 +1,6 @@
 #include "app/windowroutines.h"
 
-#include "app/cursorfile.h"
+#include "base/cursorfile.h"
 
 #include <QCheckBox>
 #include <QDir>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "app/programfiles.h"
+#include "base/programfiles.h"
 
 #include <QCursor>
 #include <QString>

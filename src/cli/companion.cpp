@@ -1,9 +1,9 @@
 #include "cli/companion.h"
 
-#include "app/clock.h"
-#include "app/failure.h"
-#include "app/pointer.h"
-#include "app/programfiles.h"
+#include "base/clock.h"
+#include "base/failure.h"
+#include "base/pointer.h"
+#include "base/programfiles.h"
 #include "generate/generation.h"
 #include "generate/randomsource.h"
 #include "names/database.h"

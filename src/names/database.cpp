@@ -1,6 +1,6 @@
 #include "names/database.h"
 
-#include "app/failure.h"
+#include "base/failure.h"
 
 #include <QDir>
 

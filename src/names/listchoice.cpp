@@ -1,6 +1,6 @@
 #include "names/listchoice.h"
 
-#include "app/settings.h"
+#include "base/settings.h"
 
 using namespace Qt::StringLiterals;
 

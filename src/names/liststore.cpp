@@ -1,6 +1,6 @@
 #include "names/liststore.h"
 
-#include "app/failure.h"
+#include "base/failure.h"
 
 #include <QFileInfo>
 

@@ -1,6 +1,6 @@
 #include "names/namelists.h"
 
-#include "app/pointer.h"
+#include "base/pointer.h"
 #include "names/database.h"
 
 NameLists::NameLists(QString databasePath, PointerOwner& window)

@@ -1,7 +1,7 @@
 #include "results/spreadsheet.h"
 
-#include "app/failure.h"
-#include "app/shell.h"
+#include "base/failure.h"
+#include "base/shell.h"
 #include "results/resultrows.h"
 
 #include <QDateTime>

@@ -1,6 +1,6 @@
 #include "results/textfile.h"
 
-#include "app/failure.h"
+#include "base/failure.h"
 #include "results/resultrows.h"
 
 #include <QDir>

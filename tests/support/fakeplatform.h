@@ -1,8 +1,8 @@
 #pragma once
 
-#include "app/clock.h"
-#include "app/failure.h"
-#include "app/shell.h"
+#include "base/clock.h"
+#include "base/failure.h"
+#include "base/shell.h"
 
 #include <QStringList>
 #include <QUrl>

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "app/pointer.h"
+#include "base/pointer.h"
 
 #include <QList>
 

@@ -1,7 +1,7 @@
 #pragma once
 
 #include "app/environment.h"
-#include "app/settings.h"
+#include "base/settings.h"
 #include "generate/randomsource.h"
 #include "support/fakedialogs.h"
 #include "support/fakeplatform.h"

@@ -8,7 +8,7 @@
 // ends. Closing it ends the program.
 
 #include "app/environment.h"
-#include "app/pointer.h"
+#include "base/pointer.h"
 #include "results/resultsmodel.h"
 
 #include <QWidget>

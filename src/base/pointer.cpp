@@ -1,4 +1,4 @@
-#include "app/pointer.h"
+#include "base/pointer.h"
 
 void applyHoverRule(PointerOwner& window, int pointer)
 {

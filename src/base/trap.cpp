@@ -1,6 +1,6 @@
-#include "app/trap.h"
+#include "base/trap.h"
 
-#include "app/failure.h"
+#include "base/failure.h"
 
 Trap::Trap(Dialogs& dialogs, QString location, ClosingLine closing)
     : m_dialogs(dialogs)

@@ -1,6 +1,6 @@
-#include "app/shell.h"
+#include "base/shell.h"
 
-#include "app/failure.h"
+#include "base/failure.h"
 
 #include <QDir>
 #include <QDirIterator>

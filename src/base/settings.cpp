@@ -1,6 +1,6 @@
-#include "app/settings.h"
+#include "base/settings.h"
 
-#include "app/failure.h"
+#include "base/failure.h"
 
 #include <QLocale>
 

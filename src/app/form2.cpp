@@ -1,11 +1,11 @@
-#include "results/form2.h"
+#include "app/form2.h"
 
 #include "app/layout.h"
-#include "app/trap.h"
+#include "base/trap.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
-#include "results/resultssaver.h"
+#include "app/resultssaver.h"
 
 #include <QApplication>
 #include <QCloseEvent>

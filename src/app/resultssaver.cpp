@@ -1,7 +1,7 @@
-#include "results/resultssaver.h"
+#include "app/resultssaver.h"
 
-#include "app/dialogs.h"
-#include "app/trap.h"
+#include "base/dialogs.h"
+#include "base/trap.h"
 #include "results/resultrows.h"
 #include "results/spreadsheet.h"
 #include "results/textfile.h"

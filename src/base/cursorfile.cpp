@@ -1,4 +1,4 @@
-#include "app/cursorfile.h"
+#include "base/cursorfile.h"
 
 #include <QBuffer>
 #include <QImageReader>

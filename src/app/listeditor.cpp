@@ -1,10 +1,10 @@
-#include "names/listeditor.h"
+#include "app/listeditor.h"
 
-#include "app/dialogs.h"
-#include "app/failure.h"
-#include "app/pointer.h"
-#include "app/programfiles.h"
-#include "app/trap.h"
+#include "base/dialogs.h"
+#include "base/failure.h"
+#include "base/pointer.h"
+#include "base/programfiles.h"
+#include "base/trap.h"
 #include "names/database.h"
 #include "names/namelists.h"
 
