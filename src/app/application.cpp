@@ -1,10 +1,10 @@
 #include "app/application.h"
 
-#include "base/dialogs.h"
 #include "app/environment.h"
-#include "base/failure.h"
 #include "app/form1.h"
 #include "app/programicon.h"
+#include "base/dialogs.h"
+#include "base/failure.h"
 
 #include <cstdio>
 #include <cstdlib>
@@ -35,7 +35,7 @@ bool QuillaneApplication::notify(QObject* receiver, QEvent* event)
 
 void QuillaneApplication::endOnFailure()
 {
-    const QString description = describeCurrentException();
+    const QString description = escapeControlCharacters(describeCurrentException());
     std::fprintf(stderr, "quillane: %s\n", qUtf8Printable(description));
     if (m_dialogs) {
         m_dialogs->messageBox(u"Quillane cannot go on and will close.\n\n"_s + description,
