@@ -20,7 +20,10 @@ QuillaneApplication::QuillaneApplication(int& argc, char** argv)
 {
     setOrganizationName(u"Varnholt"_s);
     setApplicationName(u"Quillane"_s);
-    setApplicationDisplayName(ApplicationTitle);
+    // No display name: the window system integration would append it to
+    // every title. The desktop file still ties the windows to the program's
+    // entry and icon.
+    setDesktopFileName(u"quillane"_s);
     setWindowIcon(programIcon());
 }
 
