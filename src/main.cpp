@@ -1,7 +1,7 @@
 #include "app/application.h"
-#include "base/clock.h"
 #include "app/environment.h"
 #include "app/qtdialogs.h"
+#include "base/clock.h"
 #include "base/settings.h"
 #include "base/shell.h"
 #include "generate/randomsource.h"
@@ -12,6 +12,7 @@ int main(int argc, char** argv)
     QtDialogs dialogs;
     app.setDialogs(&dialogs);
     Settings settings;
+    settings.reportWriteFailuresTo(&dialogs);
     DesktopShell shell;
     SystemClock clock;
     RandomSource random;

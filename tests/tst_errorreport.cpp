@@ -1,4 +1,5 @@
-// The error report and the trap that shows it.
+// The error report and the trap that shows it, and control characters
+// escaped in the messages of both front ends.
 #include "base/errorreport.h"
 #include "base/failure.h"
 #include "base/trap.h"
@@ -6,6 +7,7 @@
 #include "support/fakedialogs.h"
 #include "support/fakepointer.h"
 
+#include <QProcess>
 #include <QTest>
 
 using namespace Qt::StringLiterals;
@@ -35,6 +37,12 @@ private Q_SLOTS:
         QTest::newRow("empty description gives an empty first line")
             << QString() << u"in Tessmark.Main.FileToListview "_s << 5 << ClosingLine::Long
             << u"\r\nin Tessmark.Main.FileToListview at line 5\r\r"
+               "Please email screenshot of this message to support@quillane.org"_s;
+        QTest::newRow("control characters of a file shown escaped")
+            << u"Bad\x1b[2J\x1b]0;title\x07name\tx\ry\x7f\u009b\u2028 A\u0308\nNext line"_s
+            << u"in Tessmark.Main.FileToListview "_s << 5 << ClosingLine::Long
+            << u"Bad\\x1b[2J\\x1b]0;title\\x07name\\tx\\ry\\x7f\\x9b\\u2028 A\u0308\nNext line"
+               "\r\nin Tessmark.Main.FileToListview at line 5\r\r"
                "Please email screenshot of this message to support@quillane.org"_s;
     }
 
@@ -81,6 +89,32 @@ private Q_SLOTS:
         };
         QCOMPARE(dialogs.messages(), (QStringList{report(u"first"_s, 20), report(u"second"_s, 30),
                                                   report(u"unable to open database file"_s, 40)}));
+    }
+
+    void cliComplaintsShowControlCharactersEscaped_data()
+    {
+        QTest::addColumn<QStringList>("arguments");
+        QTest::addColumn<QString>("complaint");
+        QTest::newRow("usage error")
+            << QStringList{u"--x\x1b[2J\ty"_s}
+            << u"quillane-cli: Unknown option '--x\\x1b[2J\\ty'. Try 'quillane-cli --help'.\n"_s;
+        QTest::newRow("failure naming a file")
+            << QStringList{u"--database"_s, u"/nonexistent/\x1b[31mred\u009b/names.mdb"_s,
+                           u"names"_s, u"first"_s}
+            << u"quillane-cli: /nonexistent/\\x1b[31mred\\x9b/names.mdb: unable to open database "
+               "file\n"_s;
+    }
+
+    // What a terminal gets on standard error.
+    void cliComplaintsShowControlCharactersEscaped()
+    {
+        QFETCH(QStringList, arguments);
+        QFETCH(QString, complaint);
+        QProcess cli;
+        cli.start(QStringLiteral(QUILLANE_CLI), arguments);
+        QVERIFY(cli.waitForFinished(60000));
+        QCOMPARE(QString::fromUtf8(cli.readAllStandardError()), complaint);
+        QVERIFY(cli.exitCode() != 0);
     }
 };
 

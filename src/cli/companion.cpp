@@ -545,10 +545,12 @@ namespace Companion {
 int run(const QStringList& arguments, const QString& programFolder, std::FILE* out, std::FILE* err)
 {
     // Every line of a complaint names the program, as a script's log
-    // shows it among other programs' lines.
+    // shows it among other programs' lines. A complaint may quote a file or
+    // an argument, whose control characters a terminal would obey.
     const auto complain = [err](const QString& message) {
         for (const QString& line : message.split(u'\n'))
-            std::fputs(qUtf8Printable(Program + u": "_s + line + u'\n'), err);
+            std::fputs(qUtf8Printable(Program + u": "_s + escapeControlCharacters(line) + u'\n'),
+                       err);
     };
     QString database = namesDatabasePath(programFolder);
     try {
