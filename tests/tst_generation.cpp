@@ -1,6 +1,7 @@
 // Generation without windows: the count box's reading, the tidying of names,
 // the draws and the progress a run reports.
 #include "generate/generation.h"
+#include "support/randomindex.h"
 
 #include <QTest>
 
@@ -129,6 +130,7 @@ private Q_SLOTS:
         QList<int> everyValue(101);
         std::iota(everyValue.begin(), everyValue.end(), 0);
         QTest::newRow("three") << 3 << QList<int>{33, 67, 100};
+        QTest::newRow("halves to even") << 8 << QList<int>{12, 25, 38, 50, 62, 75, 88, 100};
         QTest::newRow("long run: each value once") << 123457 << everyValue;
     }
 
