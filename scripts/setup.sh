@@ -7,7 +7,8 @@
 #   scripts/setup.sh build   install what is missing, build (for other scripts)
 #
 # Environment: BUILD_DIR (default: build), QUILLANE_WERROR=ON to fail on
-# warnings, QUILLANE_SANITIZE=ON for an AddressSanitizer/UBSan build.
+# warnings, QUILLANE_SANITIZE=ON for an AddressSanitizer/UBSan build,
+# QUILLANE_COVERAGE=ON for a build that counts coverage (scripts/coverage.sh).
 set -euo pipefail
 
 mode=${1:-}
@@ -29,6 +30,8 @@ packages=(
     xvfb xauth dbus python3-openpyxl
     # for checking the installed menu entry
     desktop-file-utils
+    # for scripts/coverage.sh
+    gcovr
     # for scripts/fuzz.sh (libFuzzer)
     clang libclang-rt-14-dev
 )
@@ -38,7 +41,8 @@ install_missing "${packages[@]}"
 cmake -S "$top" -B "$build" -G Ninja \
     -DCMAKE_BUILD_TYPE="${CMAKE_BUILD_TYPE:-Release}" \
     -DQUILLANE_WERROR="${QUILLANE_WERROR:-OFF}" \
-    -DQUILLANE_SANITIZE="${QUILLANE_SANITIZE:-OFF}"
+    -DQUILLANE_SANITIZE="${QUILLANE_SANITIZE:-OFF}" \
+    -DQUILLANE_COVERAGE="${QUILLANE_COVERAGE:-OFF}"
 cmake --build "$build"
 
 case "$mode" in

@@ -11,9 +11,6 @@
 
 using namespace Qt::StringLiterals;
 
-const QStringList Tables{u"system_mfirstname"_s, u"system_ffirstname"_s, u"system_lastname"_s,
-                         u"user_firstname"_s, u"user_lastname"_s};
-
 class TestDatabase : public QObject {
     Q_OBJECT
 
@@ -24,7 +21,7 @@ class TestDatabase : public QObject {
     QStringList everything() const
     {
         QStringList all;
-        for (const QString& table : Tables)
+        for (const QString& table : DatabaseTables)
             all.append(tableColumn(m_path, table, u"*"_s).join(u','));
         return all;
     }
@@ -53,9 +50,11 @@ private Q_SLOTS:
         QTest::addColumn<QString>("lastNames");
         QTest::addColumn<QString>("failure");
 
-        // The options: built-in, user; both, male, female.
-        const ListChoice both{1, 0, 1, 0, 0}, male{1, 0, 0, 1, 0}, female{1, 0, 0, 0, 1};
-        const ListChoice user{0, 1, 1, 0, 0}, noGender{1, 0, 0, 0, 0}, noSource{0, 0, 1, 0, 0};
+        // Each as it differs from the first start's choice: the built-in list, both genders.
+        const ListChoice both{}, male{.both = false, .male = true};
+        const ListChoice female{.both = false, .female = true};
+        const ListChoice user{.builtIn = false, .user = true}, noGender{.both = false};
+        const ListChoice noSource{.builtIn = false};
         const QString last = u"ADAMS,Jones,Jones,smith"_s, kept = u"kept"_s;
         const auto row = [](const char* tag, ListChoice c, QString f, QString l, QString e = {}) {
             QTest::newRow(tag) << c << f << l << e; // choice, the two panes, the failure
@@ -126,7 +125,7 @@ private Q_SLOTS:
         // The table a statement names: "insert into T ...", "delete from T ...".
         const QString table = QString::fromLatin1(sql).section(u' ', 2, 2);
         QStringList expected = everything();
-        expected[Tables.indexOf(table)] = rows;
+        expected[DatabaseTables.indexOf(table)] = rows;
         Connection c(m_path);
         name.isNull() ? c.execute(sql.constData()) : c.execute(sql.constData(), name);
         QCOMPARE(everything(), expected);
@@ -135,7 +134,7 @@ private Q_SLOTS:
     void shippedDatabaseHoldsTheBuiltInLists()
     {
         QList<qsizetype> counts;
-        for (const QString& table : Tables)
+        for (const QString& table : DatabaseTables)
             counts.append(tableColumn(QStringLiteral(QUILLANE_SHIPPED_DB), table, u"*"_s).size());
         QCOMPARE(counts, (QList<qsizetype>{1219, 4275, 88799, 0, 0}));
     }

@@ -115,8 +115,9 @@ private:
     std::vector<std::uint32_t> m_slots;
 };
 
-// RandomIndex less one, as the loop's integer: for a draw of 0 or more,
-// truncation is the floor, without the library call.
+// A position from 0 to n - 1, each equally likely. For a draw of 0 or more,
+// truncation is the floor, without the library call; r * n never rounds up
+// to n for any n of 32 bits.
 inline int drawPosition(RandomSource& random, int n)
 {
     return int(random.next() * n);

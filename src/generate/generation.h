@@ -17,13 +17,6 @@
 #include <functional>
 #include <vector>
 
-// One draw: a whole number from 1 to n, each equally likely, as a real
-// number. Exact for every n of 32 bits: r * n never rounds up to n.
-inline double RandomIndex(RandomSource& random, int n)
-{
-    return std::floor(random.next() * n) + 1.0;
-}
-
 // The text without any U+0020; tabs and other blanks stay.
 QString StripSpaces(const QString& text);
 
