@@ -1,10 +1,13 @@
 // Saving the results list: the text file's bytes and its safe replacement,
 // the workbook as an independent reader sees it, and the reports a user gets
 // when something fails.
+#include "app/resultssaver.h"
 #include "base/errorreport.h"
+#include "base/failure.h"
+#include "base/safefile.h"
 #include "results/resultrows.h"
 #include "results/resultsmodel.h"
-#include "app/resultssaver.h"
+#include "results/spreadsheet.h"
 #include "results/textfile.h"
 #include "support/fakedialogs.h"
 #include "support/fakeplatform.h"
@@ -12,12 +15,24 @@
 
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
 #include <QProcess>
 #include <QTemporaryDir>
 #include <QTest>
 
 #include <csignal>
+#include <ctime>
+#include <functional>
+#include <thread>
+
+#include <fcntl.h>
+#include <grp.h>
+#include <pwd.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
+#include <sys/sysmacros.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 using namespace Qt::StringLiterals;
 
@@ -60,6 +75,104 @@ void verifyOneReport(const FakeDialogs& dialogs, int line, const QString& start)
     QVERIFY2(description.startsWith(start), qPrintable(report.text));
     QCOMPARE(report.text, errorReportText(description, u"in Tessmark.Form2.PushButton2_Click "_s,
                                           line, ClosingLine::Long));
+}
+
+// What a save is pointed at, in a folder that holds "out" (mode 640) and
+// the names database.
+enum class Target {
+    Regular,
+    NewName,
+    Link,             // "link" -> out
+    ReadOnly,         // out, mode 444, saved by an unprivileged user
+    Fifo,             // a reader takes what is written
+    NullDevice,       // a character device like /dev/null
+    FullDevice,       // like /dev/full
+    FullDisk,         // a file size limit
+    Stale,            // temporary files of other processes beside out
+    DatabaseRelative, // names.mdb, from the folder itself
+    DatabaseLink,     // "link.txt" -> names.mdb
+};
+
+const QString NamesDatabase = u"it is the names database, whose lists the results would replace"_s;
+
+// Saves rows to path as a text file through the results window, or as a
+// workbook as quillane-cli saves one; the failure's text, empty for none.
+QString saveAs(bool workbook, const QString& path, const QString& database, const ResultRows& rows)
+{
+    if (workbook) {
+        try {
+            saveWorkbook(rows, OutputChoice::SpreadsheetTwoCells, path, database);
+            return {};
+        } catch (const Failure& failure) {
+            return failure.description();
+        }
+    }
+    FakeDialogs dialogs;
+    FakeShell shell;
+    dialogs.answerSave(path);
+    ResultsSaver(dialogs, shell, QDir::tempPath(), database).save(OutputChoice::TextFile, rows);
+    if (dialogs.messages().isEmpty())
+        return {};
+    const QString report = dialogs.messages().constLast();
+    const QString description = report.section(u"\r\n"_s, 0, 0);
+    return report
+                   == errorReportText(description, u"in Tessmark.Form2.PushButton2_Click "_s, 30,
+                                      ClosingLine::Long)
+               ? description
+               : u"not the report of step 30: "_s + report;
+}
+
+// Runs work in a child process as the unprivileged user "nobody" and
+// returns what it returns.
+QString asNobody(const std::function<QString()>& work)
+{
+    const passwd* nobody = ::getpwnam("nobody");
+    int channel[2];
+    if (!nobody || ::pipe(channel) != 0)
+        return u"no user nobody"_s;
+    const pid_t child = ::fork();
+    if (child == 0) {
+        ::close(channel[0]);
+        if (::setgroups(0, nullptr) != 0 || ::setgid(nobody->pw_gid) != 0
+            || ::setuid(nobody->pw_uid) != 0)
+            ::_exit(2);
+        const QByteArray answer = work().toUtf8();
+        const bool sent =
+            ::write(channel[1], answer.constData(), std::size_t(answer.size())) == answer.size();
+        ::_exit(sent ? 0 : 1);
+    }
+    ::close(channel[1]);
+    QFile answer;
+    QByteArray bytes;
+    if (answer.open(channel[0], QIODevice::ReadOnly, QFileDevice::AutoCloseHandle))
+        bytes = answer.readAll();
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    return WIFEXITED(status) && WEXITSTATUS(status) == 0 ? QString::fromUtf8(bytes)
+                                                         : u"the child failed"_s;
+}
+
+// A process id that no process has (any more).
+pid_t deadProcess()
+{
+    const pid_t child = ::fork();
+    if (child == 0)
+        ::_exit(0);
+    ::waitpid(child, nullptr, 0);
+    return child;
+}
+
+mode_t modeOf(const QString& path)
+{
+    struct stat info {};
+    return ::lstat(QFile::encodeName(path).constData(), &info) == 0 ? info.st_mode : 0;
+}
+
+void writeFile(const QString& path, const QByteArray& bytes)
+{
+    QFile file(path);
+    if (file.open(QIODevice::WriteOnly))
+        file.write(bytes);
 }
 
 } // namespace
@@ -161,6 +274,177 @@ private Q_SLOTS:
                            {u"Zoë"_s, u"\"Jr\""_s},
                            {u"Ann, B"_s, u"Lee"_s}};
         QCOMPARE(layout(ListRows(byName)), bytes);
+    }
+
+    // Every file is written by one rule, the same for a text file and a
+    // workbook: what can be replaced is replaced whole or not at all, with
+    // its mode; a link's target is replaced; devices and FIFOs are written
+    // as they are; what the user may not write, and the names database
+    // however reached, are refused; failures give the system's text.
+    void everyFileByOneRule_data()
+    {
+        QTest::addColumn<bool>("workbook");
+        QTest::addColumn<Target>("target");
+        QTest::addColumn<QString>("error"); // after "could not be saved: "; empty for none
+        for (const bool workbook : {false, true}) {
+            const auto row = [workbook](const char* name, Target target, const QString& error) {
+                QTest::addRow("%s: %s", workbook ? "workbook" : "text", name)
+                    << workbook << target << error;
+            };
+            row("regular file", Target::Regular, {});
+            row("new name", Target::NewName, {});
+            row("link: its target", Target::Link, {});
+            row("read-only file", Target::ReadOnly, u"Permission denied"_s);
+            row("FIFO", Target::Fifo, {});
+            row("character device", Target::NullDevice, {});
+            row("device full", Target::FullDevice, u"No space left on device"_s);
+            row("file size limit", Target::FullDisk, u"File too large"_s);
+            row("stale temporary files", Target::Stale, {});
+            row("database, relative", Target::DatabaseRelative, NamesDatabase);
+            row("database, link", Target::DatabaseLink, NamesDatabase);
+        }
+    }
+
+    void everyFileByOneRule()
+    {
+        QFETCH(bool, workbook);
+        QFETCH(Target, target);
+        QFETCH(QString, error);
+        const bool root = ::geteuid() == 0;
+        if ((target == Target::NullDevice || target == Target::FullDevice) && !root)
+            QSKIP("Only root makes device nodes.");
+        if (target == Target::ReadOnly && !root)
+            QSKIP("Needs root to run a child as an unprivileged user (root writes any file).");
+
+        QTemporaryDir dir;
+        // The independent reader takes a workbook by its extension only.
+        const QString extension = workbook ? u".xlsx"_s : u".txt"_s;
+        const QString out = dir.filePath(u"out"_s + extension),
+                      database = dir.filePath(u"names.mdb"_s);
+        writeFile(out, "old");
+        QFile::setPermissions(out, QFile::ReadOwner | QFile::WriteOwner | QFile::ReadGroup);
+        writeFile(database, "names");
+        const QByteArray folder = QFile::encodeName(dir.path());
+        const auto node = [&](const char* name) { return QByteArray(folder + '/' + name); };
+        const QString fresh = SafeFile::temporaryPrefix(::getppid()) + u"Fresh1.part"_s;
+        const QString dead = SafeFile::temporaryPrefix(deadProcess()) + u"Dead01.part"_s;
+        const QString old = SafeFile::temporaryPrefix(::getppid()) + u"Old001.part"_s;
+        const QString notOurs = u".quillane-notes.part"_s;
+
+        QString path = out;
+        std::thread reader;
+        QByteArray received;
+        switch (target) {
+        case Target::NewName:
+            path = dir.filePath(u"new"_s + extension);
+            break;
+        case Target::Link:
+        case Target::DatabaseLink:
+            QVERIFY(::symlink(QFile::encodeName(
+                                  QFileInfo(target == Target::Link ? out : database).fileName())
+                                  .constData(),
+                              node("link").constData())
+                    == 0);
+            path = dir.filePath(u"link"_s);
+            break;
+        case Target::ReadOnly:
+            QFile::setPermissions(out, QFile::ReadOwner | QFile::ReadGroup | QFile::ReadOther);
+            // The folder lets anyone make a file: only the file's mode refuses.
+            QVERIFY(::chmod(folder.constData(), 0777) == 0);
+            break;
+        case Target::Fifo:
+            QVERIFY(::mkfifo(node("fifo").constData(), 0600) == 0);
+            path = dir.filePath(u"fifo"_s);
+            reader = std::thread([&] {
+                QFile fifo(path);
+                if (fifo.open(QIODevice::ReadOnly))
+                    received = fifo.readAll();
+            });
+            break;
+        case Target::NullDevice:
+        case Target::FullDevice:
+            QVERIFY(::mknod(node("device").constData(), S_IFCHR | 0666,
+                            ::makedev(1, target == Target::NullDevice ? 3 : 7))
+                    == 0);
+            path = dir.filePath(u"device"_s);
+            break;
+        case Target::Stale:
+            for (const QString& name : {fresh, dead, old, notOurs})
+                writeFile(dir.filePath(name), "part");
+            {
+                const timespec twoDaysAgo{std::time(nullptr) - 2 * 24 * 3600, 0};
+                const timespec times[2] = {twoDaysAgo, twoDaysAgo};
+                QVERIFY(::utimensat(AT_FDCWD, QFile::encodeName(dir.filePath(old)).constData(),
+                                    times, 0)
+                        == 0);
+            }
+            break;
+        case Target::DatabaseRelative:
+            QVERIFY(QDir::setCurrent(dir.path()));
+            path = u"names.mdb"_s;
+            break;
+        default:
+            break;
+        }
+
+        const ListRows rows(target == Target::FullDisk ? Names(2000, {u"First"_s, u"Last"_s})
+                                                       : AnnBob);
+        const auto save = [&] { return saveAs(workbook, path, database, rows); };
+        QString failure;
+        if (target == Target::ReadOnly) {
+            failure = asNobody(save);
+        } else if (target == Target::FullDisk) {
+            const rlimit small{4096, RLIM_INFINITY}, unlimited{RLIM_INFINITY, RLIM_INFINITY};
+            std::signal(SIGXFSZ, SIG_IGN);
+            setrlimit(RLIMIT_FSIZE, &small);
+            failure = save();
+            setrlimit(RLIMIT_FSIZE, &unlimited);
+        } else {
+            failure = save();
+        }
+        if (reader.joinable()) {
+            if (!failure.isEmpty()) // let a reader that got nothing go
+                ::close(::open(path.toLocal8Bit().constData(), O_WRONLY | O_NONBLOCK));
+            reader.join();
+        }
+        QDir::setCurrent(QDir::tempPath());
+
+        if (error.isEmpty())
+            QCOMPARE(failure, QString());
+        else
+            QCOMPARE(failure, u"The file %1 could not be saved: %2"_s.arg(path, error));
+
+        const QByteArray text("Ann Lee\r\nBob Stone\r\n");
+        const QString cells = u"A1 Ann,B1 Lee,A2 Bob,B2 Stone"_s;
+        const auto holdsTheRows = [&](const QString& file) {
+            return workbook ? readWorkbook(file) == cells : readAll(file) == text;
+        };
+        const bool replaced =
+            error.isEmpty()
+            && (target == Target::Regular || target == Target::Link || target == Target::Stale);
+        QVERIFY(replaced ? holdsTheRows(out) : readAll(out) == "old");
+        QCOMPARE(modeOf(out) & 0777, target == Target::ReadOnly ? 0444u : 0640u);
+        QCOMPARE(readAll(database), QByteArray("names"));
+        if (target == Target::NewName) {
+            QVERIFY(holdsTheRows(path));
+            const mode_t mask = ::umask(0);
+            ::umask(mask);
+            QCOMPARE(modeOf(path) & 0777, 0666 & ~mask);
+        }
+        if (target == Target::Link || target == Target::DatabaseLink)
+            QVERIFY(S_ISLNK(modeOf(path)));
+        if (target == Target::Fifo) {
+            QVERIFY(S_ISFIFO(modeOf(path)));
+            QVERIFY(workbook ? received.startsWith("PK\x03\x04") : received == text);
+        }
+        if (target == Target::NullDevice || target == Target::FullDevice)
+            QVERIFY(S_ISCHR(modeOf(path)));
+
+        // No temporary file is left, and of the others' only those whose
+        // process still runs and that are not old, and names not ours.
+        QStringList left = entries(dir.path()).filter(u".part"_s);
+        left.sort();
+        QCOMPARE(left, (target == Target::Stale ? QStringList{fresh, notOurs} : QStringList()));
     }
 
     void workbook_data()
