@@ -12,7 +12,6 @@
 #include <cstdio>
 #include <cstring>
 #include <ctime>
-#include <optional>
 #include <utility>
 
 #include <dirent.h>
@@ -90,36 +89,6 @@ void removeStale(const QByteArray& folder)
     }
     ::closedir(dir);
 }
-
-// A write to a pipe whose reader is gone fails with EPIPE instead of
-// ending the program by SIGPIPE.
-class PipeSignalHeld {
-public:
-    PipeSignalHeld()
-    {
-        sigemptyset(&m_pipe);
-        sigaddset(&m_pipe, SIGPIPE);
-        sigset_t pending;
-        m_wasPending = sigpending(&pending) == 0 && sigismember(&pending, SIGPIPE) == 1;
-        pthread_sigmask(SIG_BLOCK, &m_pipe, &m_old);
-    }
-    ~PipeSignalHeld()
-    {
-        if (m_raised && !m_wasPending) {
-            const timespec now{};
-            while (sigtimedwait(&m_pipe, nullptr, &now) < 0 && errno == EINTR) {
-            }
-        }
-        pthread_sigmask(SIG_SETMASK, &m_old, nullptr);
-    }
-    void raised() { m_raised = true; }
-
-private:
-    sigset_t m_pipe;
-    sigset_t m_old;
-    bool m_wasPending = false;
-    bool m_raised = false;
-};
 
 } // namespace
 
@@ -241,9 +210,7 @@ void SafeFile::write(QByteArrayView bytes)
 {
     if (m_fd < 0 || m_failed)
         fail(EBADF);
-    std::optional<PipeSignalHeld> pipeSignal;
-    if (m_direct)
-        pipeSignal.emplace();
+    const WriteSignalsHeld held;
     const char* data = bytes.data();
     qsizetype left = bytes.size();
     while (left > 0) {
@@ -252,8 +219,6 @@ void SafeFile::write(QByteArrayView bytes)
             if (errno == EINTR)
                 continue;
             const int error = errno;
-            if (error == EPIPE && pipeSignal)
-                pipeSignal->raised();
             m_failed = true;
             fail(error);
         }
@@ -316,4 +281,32 @@ void SafeFile::discard()
         ::unlink(QFile::encodeName(m_temporary).constData());
         m_temporary.clear();
     }
+}
+
+WriteSignalsHeld::WriteSignalsHeld()
+{
+    sigemptyset(&m_held);
+    sigaddset(&m_held, SIGPIPE);
+    sigaddset(&m_held, SIGXFSZ);
+    if (sigpending(&m_pendingBefore) != 0)
+        sigemptyset(&m_pendingBefore);
+    pthread_sigmask(SIG_BLOCK, &m_held, &m_old);
+}
+
+WriteSignalsHeld::~WriteSignalsHeld()
+{
+    sigset_t pending;
+    if (sigpending(&pending) == 0) {
+        for (const int signal : {SIGPIPE, SIGXFSZ}) {
+            if (sigismember(&pending, signal) != 1 || sigismember(&m_pendingBefore, signal) == 1)
+                continue;
+            sigset_t one;
+            sigemptyset(&one);
+            sigaddset(&one, signal);
+            const timespec now{};
+            while (sigtimedwait(&one, nullptr, &now) < 0 && errno == EINTR) {
+            }
+        }
+    }
+    pthread_sigmask(SIG_SETMASK, &m_old, nullptr);
 }

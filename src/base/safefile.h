@@ -3,6 +3,8 @@
 #include <QByteArrayView>
 #include <QString>
 
+#include <csignal>
+
 #include <sys/types.h>
 
 // The one way the program writes a file.
@@ -78,4 +80,23 @@ private:
     uid_t m_targetOwner = 0;
     gid_t m_targetGroup = 0;
     bool m_failed = false;
+};
+
+// While one lives, on this thread, a write beyond the file size limit or to
+// a pipe whose reader is gone fails (EFBIG, EPIPE) instead of ending the
+// program by a signal; the failure is then reported like any other.
+// SafeFile holds them for its own writes; a writer that writes a file of
+// its own (libxlsxwriter) is run under one.
+class WriteSignalsHeld {
+public:
+    WriteSignalsHeld();
+    // Discards the signals raised meanwhile.
+    ~WriteSignalsHeld();
+    WriteSignalsHeld(const WriteSignalsHeld&) = delete;
+    WriteSignalsHeld& operator=(const WriteSignalsHeld&) = delete;
+
+private:
+    sigset_t m_held;
+    sigset_t m_pendingBefore;
+    sigset_t m_old;
 };

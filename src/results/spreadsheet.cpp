@@ -6,12 +6,12 @@
 #include "results/resultrows.h"
 #include "results/resultsfile.h"
 
+#include <QCoreApplication>
 #include <QDateTime>
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
 #include <QStringEncoder>
-#include <QTemporaryFile>
 
 #include <xlsxwriter.h>
 
@@ -143,12 +143,13 @@ WorkbookFile::WorkbookFile(std::unique_ptr<SafeFile> file)
 {
     QString target = m_file->temporaryPath();
     if (target.isEmpty()) {
-        m_staging = std::make_unique<QTemporaryFile>(
-            QDir(QDir::tempPath()).filePath(u"quillane-workbook-XXXXXX.xlsx"_s));
-        if (!m_staging->open())
-            throw Failure(u"The file %1 could not be saved: %2"_s.arg(
-                QDir::toNativeSeparators(m_file->path()), m_staging->errorString()));
-        target = m_staging->fileName();
+        // Named as any temporary file of ours, so that one left by a kill
+        // is removed in time; never given its final name.
+        m_staging = std::make_unique<SafeFile>(
+            QDir(QDir::tempPath())
+                .filePath(u"quillane-workbook-%1.xlsx"_s.arg(QCoreApplication::applicationPid())),
+            SafeFile::Mode::CreateNew);
+        target = m_staging->temporaryPath();
     }
 
     const QByteArray fileName = QFile::encodeName(target);
@@ -229,7 +230,7 @@ void WorkbookFile::save()
 
     if (m_staging) {
         // A device or a FIFO gets the finished workbook's bytes.
-        QFile staged(m_staging->fileName());
+        QFile staged(m_staging->temporaryPath());
         if (!staged.open(QIODevice::ReadOnly))
             throw fail(staged.errorString());
         QByteArray chunk;

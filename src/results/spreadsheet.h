@@ -1,5 +1,6 @@
 #pragma once
 
+#include "base/safefile.h"
 #include "results/outputchoice.h"
 
 #include <QByteArray>
@@ -7,9 +8,7 @@
 
 #include <memory>
 
-class QTemporaryFile;
 class ResultRows;
-class SafeFile;
 class Shell;
 struct lxw_workbook;
 struct lxw_worksheet;
@@ -83,11 +82,13 @@ public:
 private:
     void discard();
 
+    // libxlsxwriter writes files of its own all along.
+    WriteSignalsHeld m_signals;
     std::unique_ptr<SafeFile> m_file;
     // Where libxlsxwriter writes: the safe file's temporary file, or, for a
     // device or a FIFO that is written directly, a file of its own in the
     // temporary folder, copied there once complete.
-    std::unique_ptr<QTemporaryFile> m_staging;
+    std::unique_ptr<SafeFile> m_staging;
     lxw_workbook* m_book = nullptr;
     Worksheet m_sheet;
 };
