@@ -85,6 +85,7 @@ enum class Target {
     Link,             // "link" -> out
     ReadOnly,         // out, mode 444, saved by an unprivileged user
     Fifo,             // a reader takes what is written
+    FifoReaderGone,   // the reader leaves before the end
     NullDevice,       // a character device like /dev/null
     FullDevice,       // like /dev/full
     FullDisk,         // a file size limit
@@ -296,6 +297,7 @@ private Q_SLOTS:
             row("link: its target", Target::Link, {});
             row("read-only file", Target::ReadOnly, u"Permission denied"_s);
             row("FIFO", Target::Fifo, {});
+            row("FIFO, reader gone", Target::FifoReaderGone, u"Broken pipe"_s);
             row("character device", Target::NullDevice, {});
             row("device full", Target::FullDevice, u"No space left on device"_s);
             row("file size limit", Target::FullDisk, u"File too large"_s);
@@ -353,11 +355,12 @@ private Q_SLOTS:
             QVERIFY(::chmod(folder.constData(), 0777) == 0);
             break;
         case Target::Fifo:
+        case Target::FifoReaderGone:
             QVERIFY(::mkfifo(node("fifo").constData(), 0600) == 0);
             path = dir.filePath(u"fifo"_s);
-            reader = std::thread([&] {
+            reader = std::thread([&, all = target == Target::Fifo] {
                 QFile fifo(path);
-                if (fifo.open(QIODevice::ReadOnly))
+                if (fifo.open(QIODevice::ReadOnly) && all)
                     received = fifo.readAll();
             });
             break;
@@ -387,19 +390,25 @@ private Q_SLOTS:
             break;
         }
 
-        const ListRows rows(target == Target::FullDisk ? Names(2000, {u"First"_s, u"Last"_s})
-                                                       : AnnBob);
+        // More than a pipe holds, in a workbook too.
+        Names many;
+        for (int i = 0; i < 20000; ++i)
+            many.append({u"First%1"_s.arg(i * 7919 % 20011), u"Last%1"_s.arg(i)});
+        const ListRows rows(
+            target == Target::FullDisk || target == Target::FifoReaderGone ? many : AnnBob);
         const auto save = [&] { return saveAs(workbook, path, database, rows); };
         QString failure;
         if (target == Target::ReadOnly) {
             failure = asNobody(save);
         } else if (target == Target::FullDisk) {
+            // The signal as a program gets it: it must not end the program.
             const rlimit small{4096, RLIM_INFINITY}, unlimited{RLIM_INFINITY, RLIM_INFINITY};
-            std::signal(SIGXFSZ, SIG_IGN);
+            std::signal(SIGXFSZ, SIG_DFL);
             setrlimit(RLIMIT_FSIZE, &small);
             failure = save();
             setrlimit(RLIMIT_FSIZE, &unlimited);
         } else {
+            std::signal(SIGPIPE, SIG_DFL);
             failure = save();
         }
         if (reader.joinable()) {
