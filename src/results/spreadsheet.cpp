@@ -16,12 +16,16 @@
 #include <xlsxwriter.h>
 
 #include <cerrno>
+#include <cstdint>
 #include <cstdio>
 #include <cstring>
 #include <memory>
 #include <utility>
 
 #include <fcntl.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
+#include <sys/statvfs.h>
 #include <unistd.h>
 
 using namespace Qt::StringLiterals;
@@ -210,6 +214,27 @@ void WorkbookFile::save()
             const int error = errno != 0 ? errno : EIO;
             discard();
             throw fail(QString::fromLocal8Bit(std::strerror(error)));
+        }
+        // Closing copies those rows into the sheet, again unchecked, and
+        // zips the sheet while the copy exists: on a disk that fills up
+        // halfway the workbook would lose rows and still be written. So
+        // the room for both is there first, or it is a full disk now.
+        struct stat info {};
+        if (::fstat(::fileno(rows), &info) == 0) {
+            const auto needed = std::uintmax_t(info.st_size) * 2 + (1u << 20);
+            struct statvfs disk {};
+            if (::fstatvfs(::fileno(rows), &disk) == 0
+                && std::uintmax_t(disk.f_bavail) * disk.f_frsize < needed) {
+                discard();
+                throw fail(QString::fromLocal8Bit(std::strerror(ENOSPC)));
+            }
+            // The sheet is the largest file, a little more than the rows.
+            rlimit limit{};
+            if (::getrlimit(RLIMIT_FSIZE, &limit) == 0 && limit.rlim_cur != RLIM_INFINITY
+                && limit.rlim_cur < std::uintmax_t(info.st_size) + (1u << 16)) {
+                discard();
+                throw fail(QString::fromLocal8Bit(std::strerror(EFBIG)));
+            }
         }
     }
     // Closing writes the file and frees the workbook, whatever its outcome.
