@@ -18,9 +18,11 @@
 #include <QFileInfo>
 #include <QProcess>
 #include <QTemporaryDir>
+#include <QTemporaryFile>
 #include <QTest>
 
 #include <csignal>
+#include <cstdio>
 #include <ctime>
 #include <functional>
 #include <thread>
@@ -28,6 +30,7 @@
 #include <fcntl.h>
 #include <grp.h>
 #include <pwd.h>
+#include <sys/mount.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/sysmacros.h>
@@ -88,7 +91,8 @@ enum class Target {
     FifoReaderGone,   // the reader leaves before the end
     NullDevice,       // a character device like /dev/null
     FullDevice,       // like /dev/full
-    FullDisk,         // a file size limit
+    FileSizeLimit,    // the process may write no more than 4 KB to a file
+    DiskFull,         // the folder is a small file system of its own
     Stale,            // temporary files of other processes beside out
     DatabaseRelative, // names.mdb, from the folder itself
     DatabaseLink,     // "link.txt" -> names.mdb
@@ -300,7 +304,8 @@ private Q_SLOTS:
             row("FIFO, reader gone", Target::FifoReaderGone, u"Broken pipe"_s);
             row("character device", Target::NullDevice, {});
             row("device full", Target::FullDevice, u"No space left on device"_s);
-            row("file size limit", Target::FullDisk, u"File too large"_s);
+            row("file size limit", Target::FileSizeLimit, u"File too large"_s);
+            row("disk full", Target::DiskFull, u"No space left on device"_s);
             row("stale temporary files", Target::Stale, {});
             row("database, relative", Target::DatabaseRelative, NamesDatabase);
             row("database, link", Target::DatabaseLink, NamesDatabase);
@@ -319,6 +324,22 @@ private Q_SLOTS:
             QSKIP("Needs root to run a child as an unprivileged user (root writes any file).");
 
         QTemporaryDir dir;
+        struct Unmount {
+            QByteArray at;
+            ~Unmount()
+            {
+                if (!at.isEmpty())
+                    ::umount2(at.constData(), MNT_DETACH);
+            }
+        } unmount;
+        if (target == Target::DiskFull) {
+            if (!root)
+                QSKIP("Only root mounts a small file system.");
+            const QByteArray at = QFile::encodeName(dir.path());
+            if (::mount("tmpfs", at.constData(), "tmpfs", 0, "size=256k") != 0)
+                QSKIP("No small file system can be mounted here.");
+            unmount.at = at;
+        }
         // The independent reader takes a workbook by its extension only.
         const QString extension = workbook ? u".xlsx"_s : u".txt"_s;
         const QString out = dir.filePath(u"out"_s + extension),
@@ -394,13 +415,22 @@ private Q_SLOTS:
         Names many;
         for (int i = 0; i < 20000; ++i)
             many.append({u"First%1"_s.arg(i * 7919 % 20011), u"Last%1"_s.arg(i)});
-        const ListRows rows(
-            target == Target::FullDisk || target == Target::FifoReaderGone ? many : AnnBob);
+        const ListRows rows(target == Target::FileSizeLimit || target == Target::DiskFull
+                                    || target == Target::FifoReaderGone
+                                ? many
+                                : AnnBob);
         const auto save = [&] { return saveAs(workbook, path, database, rows); };
+        // Nothing on standard error beside the one report: not the workbook
+        // writer's own lines either.
+        QTemporaryFile errors;
+        QVERIFY(errors.open());
+        std::fflush(stderr);
+        const int standardError = ::dup(STDERR_FILENO);
+        ::dup2(errors.handle(), STDERR_FILENO);
         QString failure;
         if (target == Target::ReadOnly) {
             failure = asNobody(save);
-        } else if (target == Target::FullDisk) {
+        } else if (target == Target::FileSizeLimit) {
             // The signal as a program gets it: it must not end the program.
             const rlimit small{4096, RLIM_INFINITY}, unlimited{RLIM_INFINITY, RLIM_INFINITY};
             std::signal(SIGXFSZ, SIG_DFL);
@@ -411,12 +441,16 @@ private Q_SLOTS:
             std::signal(SIGPIPE, SIG_DFL);
             failure = save();
         }
+        std::fflush(stderr);
+        ::dup2(standardError, STDERR_FILENO);
+        ::close(standardError);
         if (reader.joinable()) {
             if (!failure.isEmpty()) // let a reader that got nothing go
                 ::close(::open(path.toLocal8Bit().constData(), O_WRONLY | O_NONBLOCK));
             reader.join();
         }
         QDir::setCurrent(QDir::tempPath());
+        QCOMPARE(errors.readAll(), QByteArray());
 
         if (error.isEmpty())
             QCOMPARE(failure, QString());
