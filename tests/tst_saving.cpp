@@ -86,6 +86,7 @@ enum class Target {
     Regular,
     NewName,
     Link,             // "link" -> out
+    PlantedLink,      // the same, made by another user in a shared folder
     ReadOnly,         // out, mode 444, saved by an unprivileged user
     Fifo,             // a reader takes what is written
     FifoReaderGone,   // the reader leaves before the end
@@ -299,6 +300,8 @@ private Q_SLOTS:
             row("regular file", Target::Regular, {});
             row("new name", Target::NewName, {});
             row("link: its target", Target::Link, {});
+            row("link of another user in a shared folder", Target::PlantedLink,
+                u"Permission denied"_s);
             row("read-only file", Target::ReadOnly, u"Permission denied"_s);
             row("FIFO", Target::Fifo, {});
             row("FIFO, reader gone", Target::FifoReaderGone, u"Broken pipe"_s);
@@ -320,6 +323,8 @@ private Q_SLOTS:
         const bool root = ::geteuid() == 0;
         if ((target == Target::NullDevice || target == Target::FullDevice) && !root)
             QSKIP("Only root makes device nodes.");
+        if (target == Target::PlantedLink && !root)
+            QSKIP("Only root gives a link to another user.");
         if (target == Target::ReadOnly && !root)
             QSKIP("Needs root to run a child as an unprivileged user (root writes any file).");
 
@@ -362,13 +367,21 @@ private Q_SLOTS:
             path = dir.filePath(u"new"_s + extension);
             break;
         case Target::Link:
+        case Target::PlantedLink:
         case Target::DatabaseLink:
-            QVERIFY(::symlink(QFile::encodeName(
-                                  QFileInfo(target == Target::Link ? out : database).fileName())
-                                  .constData(),
-                              node("link").constData())
-                    == 0);
+            QVERIFY(
+                ::symlink(QFile::encodeName(
+                              QFileInfo(target == Target::DatabaseLink ? database : out).fileName())
+                              .constData(),
+                          node("link").constData())
+                == 0);
             path = dir.filePath(u"link"_s);
+            if (target == Target::PlantedLink) {
+                const passwd* nobody = ::getpwnam("nobody");
+                QVERIFY(nobody
+                        && ::lchown(node("link").constData(), nobody->pw_uid, gid_t(-1)) == 0);
+                QVERIFY(::chmod(folder.constData(), 01777) == 0);
+            }
             break;
         case Target::ReadOnly:
             QFile::setPermissions(out, QFile::ReadOwner | QFile::ReadGroup | QFile::ReadOther);
@@ -474,7 +487,8 @@ private Q_SLOTS:
             ::umask(mask);
             QCOMPARE(modeOf(path) & 0777, 0666 & ~mask);
         }
-        if (target == Target::Link || target == Target::DatabaseLink)
+        if (target == Target::Link || target == Target::PlantedLink
+            || target == Target::DatabaseLink)
             QVERIFY(S_ISLNK(modeOf(path)));
         if (target == Target::Fifo) {
             QVERIFY(S_ISFIFO(modeOf(path)));

@@ -128,6 +128,13 @@ SafeFile::SafeFile(const QString& path, Mode mode)
                 m_direct = true;
                 break;
             }
+            // The kernel's rule for links in a shared folder such as /tmp:
+            // one planted there by another user is not followed.
+            struct stat shared {};
+            if (::stat(folder.constData(), &shared) == 0 && (shared.st_mode & S_ISVTX)
+                && (shared.st_mode & S_IWOTH) && info.st_uid != shared.st_uid
+                && info.st_uid != ::geteuid())
+                fail(EACCES);
             QByteArray target(qsizetype(info.st_size > 0 ? info.st_size : 4096) + 1, '\0');
             const ssize_t length = ::readlink(current.constData(), target.data(), target.size());
             if (length < 0)

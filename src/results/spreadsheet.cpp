@@ -158,8 +158,8 @@ WorkbookFile::WorkbookFile(std::unique_ptr<SafeFile> file)
 
     const QByteArray fileName = QFile::encodeName(target);
     // Rows go to a temporary file as they are written instead of staying in
-    // memory; it sits beside the workbook rather than in /tmp, which may be
-    // held in memory itself.
+    // memory; it sits beside the file being written rather than in a /tmp
+    // that may be held in memory itself.
     QByteArray tmpdir = QFile::encodeName(QFileInfo(target).absolutePath());
     lxw_workbook_options options{};
     options.constant_memory = LXW_TRUE;
