@@ -1,11 +1,11 @@
 #include "app/form2.h"
 
 #include "app/layout.h"
-#include "base/trap.h"
+#include "app/resultssaver.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
-#include "app/resultssaver.h"
+#include "base/trap.h"
 #include "names/database.h"
 
 #include <QApplication>
