@@ -315,5 +315,13 @@ WriteSignalsHeld::~WriteSignalsHeld()
             }
         }
     }
-    pthread_sigmask(SIG_SETMASK, &m_old, nullptr);
+    // Only what this one blocked is let go, so that holders that end out
+    // of order never leave a signal blocked.
+    sigset_t release;
+    sigemptyset(&release);
+    for (const int signal : {SIGPIPE, SIGXFSZ}) {
+        if (sigismember(&m_old, signal) != 1)
+            sigaddset(&release, signal);
+    }
+    pthread_sigmask(SIG_UNBLOCK, &release, nullptr);
 }
