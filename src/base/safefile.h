@@ -16,6 +16,8 @@
 // allowed, its owner) carry over; a new file gets those of any new file.
 //
 // A symbolic link is followed: its target is replaced and the link stays.
+// As the kernel does, a link that another user made in a shared sticky
+// folder such as /tmp is not followed but refused.
 // Anything else that exists (a character device, a FIFO, /dev/stdout and
 // its kin) cannot be replaced and is written directly, as a shell's
 // redirection writes it; a write that fails there (no space on the device,
