@@ -9,6 +9,7 @@
 #include "names/database.h"
 #include "names/liststore.h"
 #include "names/namelists.h"
+#include "results/resultsfile.h"
 #include "results/resultsmodel.h"
 #include "results/spreadsheet.h"
 #include "results/textfile.h"
@@ -371,11 +372,6 @@ int Command::generate()
                  : output.endsWith(u".xlsx"_s, Qt::CaseInsensitive) ? Format::Workbook2
                                                                     : Format::Text;
     }
-    // The one file whose loss a typing slip must never cause.
-    if (!output.isEmpty()
-        && QFileInfo(output).canonicalFilePath() == QFileInfo(m_database).canonicalFilePath()
-        && QFileInfo::exists(output))
-        usage(u"-o %1 would replace the names database."_s.arg(output), m_name);
     const bool workbook = format == Format::Workbook2 || format == Format::Workbook1;
     if (workbook && output.isEmpty())
         usage(u"A workbook is written to a file: give -o FILE."_s, m_name);
@@ -397,24 +393,26 @@ int Command::generate()
     ResultsModel rows;
     rows.setRows(generator.generate(count.count()));
 
-    if (workbook) {
-        const QString path = QFileInfo(output).absoluteFilePath();
-        WorkbookFile book(QFileInfo(path).absolutePath());
-        fillSheet(book.sheet(),
-                  format == Format::Workbook2 ? OutputChoice::SpreadsheetTwoCells
-                                              : OutputChoice::SpreadsheetOneCell,
-                  rows);
-        book.close();
-        book.moveTo(path, true);
-        return Companion::Done;
+    // The names database is never written over; here a slip of the
+    // command line, so a usage error.
+    try {
+        if (workbook) {
+            saveWorkbook(rows,
+                         format == Format::Workbook2 ? OutputChoice::SpreadsheetTwoCells
+                                                     : OutputChoice::SpreadsheetOneCell,
+                         output, m_database);
+            return Companion::Done;
+        }
+        const QByteArray bytes = format == Format::Text  ? resultsText(rows)
+                                 : format == Format::Csv ? resultsCsv(rows)
+                                                         : resultsLines(rows);
+        if (output.isEmpty())
+            write(bytes);
+        else
+            WriteTextFile(bytes, output, m_database);
+    } catch (const NamesDatabaseRefusal&) {
+        usage(u"-o %1 would replace the names database."_s.arg(output), m_name);
     }
-    const QByteArray bytes = format == Format::Text  ? resultsText(rows)
-                             : format == Format::Csv ? resultsCsv(rows)
-                                                     : resultsLines(rows);
-    if (output.isEmpty())
-        write(bytes);
-    else
-        WriteTextFile(bytes, output);
     return Companion::Done;
 }
 
