@@ -3,7 +3,6 @@
 #include "base/failure.h"
 #include "names/database.h"
 #include "names/namelists.h"
-#include "support/fakepointer.h"
 #include "support/testenvironment.h"
 
 #include <QFile>
@@ -80,8 +79,7 @@ private Q_SLOTS:
             QVERIFY(db.remove());
         if (database == "corrupt") // written over the database
             QVERIFY(db.open(QIODevice::WriteOnly) && db.write(QByteArray(999, 'x')) && db.flush());
-        FakePointer pointer;
-        NameLists lists(m_path, pointer);
+        NameLists lists(m_path);
         lists.firstPane().setNames({u"kept"_s});
         lists.lastPane().setNames({u"kept"_s});
         QString failure;
@@ -93,7 +91,6 @@ private Q_SLOTS:
         QTEST(failure, "failure");
         QTEST(lists.firstPane().names().join(u','), "firstNames");
         QTEST(lists.lastPane().names().join(u','), "lastNames");
-        QCOMPARE(pointer.history, (QList<int>{MousePointer::Hourglass, MousePointer::Default}));
         QCOMPARE(QFile::exists(m_path), database != "missing");
     }
 
@@ -130,6 +127,42 @@ private Q_SLOTS:
         Connection c(m_path);
         name.isNull() ? c.execute(sql.constData()) : c.execute(sql.constData(), name);
         QCOMPARE(everything(), expected);
+    }
+
+    // Only commit() keeps a transaction's work: a failure that unwinds through
+    // it, whether a statement's or the caller's, leaves every table as it was.
+    void aTransactionKeepsOnlyWhatIsCommitted_data()
+    {
+        QTest::addColumn<QString>("end"); // how the transaction ends after two inserts
+        QTest::addColumn<QString>("rows");
+        QTest::newRow("commit") << u"commit"_s << u"Yu,de Vries,Ann,Bo"_s;
+        QTest::newRow("rollback") << u"rollback"_s << u"Yu,de Vries"_s;
+        QTest::newRow("the caller fails") << u"throw"_s << u"Yu,de Vries"_s;
+        QTest::newRow("a statement fails") << u"refused"_s << u"Yu,de Vries"_s;
+    }
+
+    void aTransactionKeepsOnlyWhatIsCommitted()
+    {
+        QFETCH(QString, end);
+        Connection db(m_path);
+        db.execute("create trigger refuse before insert on user_lastname when new.lastname = "
+                   "'Bad' begin select raise(abort, 'no'); end");
+        try {
+            Connection::Transaction transaction(db);
+            db.execute(Sql::InsertUserLastName, u"Ann"_s);
+            db.execute(Sql::InsertUserLastName, u"Bo"_s);
+            if (end == u"commit")
+                transaction.commit();
+            else if (end == u"rollback")
+                transaction.rollback();
+            else if (end == u"throw")
+                throw Failure(u"the caller's"_s);
+            else
+                db.execute(Sql::InsertUserLastName, u"Bad"_s);
+        } catch (const Failure&) {
+        }
+        QVERIFY(!db.inTransaction());
+        QTEST(tableColumn(m_path, u"user_lastname"_s, u"*"_s).join(u','), "rows");
     }
 
     void shippedDatabaseHoldsTheBuiltInLists()

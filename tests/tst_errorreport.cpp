@@ -4,7 +4,6 @@
 #include "base/trap.h"
 #include "names/namelists.h"
 #include "support/fakedialogs.h"
-#include "support/fakepointer.h"
 
 #include <QTest>
 
@@ -59,8 +58,7 @@ private Q_SLOTS:
     void aTrapReportsEachFailingStepAndGoesOn()
     {
         FakeDialogs dialogs;
-        FakePointer pointer;
-        NameLists lists(u"/nonexistent/folder/names.mdb"_s, pointer);
+        NameLists lists(u"/nonexistent/folder/names.mdb"_s);
         QStringList ran;
         int turns = 0;
         Trap trap(dialogs, u"in Tessmark.Form1.PushButton8_Click "_s, ClosingLine::Long);

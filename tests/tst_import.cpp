@@ -36,7 +36,7 @@ struct Rig {
     const QString db = env.databasePath();
     FakePointer pointer;
     ListChoice choice{false, true, true, false, false};
-    NameLists lists{db, pointer};
+    NameLists lists{db};
     ListEditor editor{env.dialogs, db, lists, pointer, [this] { return choice; }};
 };
 

@@ -81,7 +81,7 @@ private Q_SLOTS:
         // A name in every table twice, as an older database may hold it: a delete takes both.
         for (qsizetype t = 0; t < Tables.size() && !c.noDatabase; ++t)
             insertRows(db, Tables[t], Columns[t], {u"O'Quill"_s, u"O'Quill"_s});
-        NameLists lists(db, pointer);
+        NameLists lists(db);
         lists.RefreshLists(c.choice);
         pointer.history.clear();
         ListEditor editor(env.dialogs, db, lists, pointer, [&] { return c.choice; });

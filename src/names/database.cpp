@@ -20,7 +20,8 @@ public:
     Statement(sqlite3* db, const char* sql)
     {
         if (sqlite3_prepare_v2(db, sql, -1, &m_stmt, nullptr) != SQLITE_OK)
-            throw Failure(QString::fromUtf8(sqlite3_errmsg(db)));
+            throw DatabaseFailure(QString::fromUtf8(sqlite3_errmsg(db)),
+                                  sqlite3_extended_errcode(db));
     }
     ~Statement() { sqlite3_finalize(m_stmt); }
     Statement(const Statement&) = delete;
@@ -39,11 +40,24 @@ int columnIndex(sqlite3_stmt* stmt, const char* name)
         if (sqlite3_stricmp(sqlite3_column_name(stmt, i), name) == 0)
             return i;
     }
-    throw Failure(u"Item cannot be found in the collection corresponding to the requested "
-                  "name or ordinal: %1"_s.arg(QString::fromUtf8(name)));
+    throw DatabaseFailure(u"Item cannot be found in the collection corresponding to the "
+                          "requested name or ordinal: %1"_s.arg(QString::fromUtf8(name)),
+                          SQLITE_ERROR);
 }
 
 } // namespace
+
+DatabaseFailure::DatabaseFailure(QString description, int code)
+    : Failure(std::move(description))
+    , m_code(code)
+{
+}
+
+bool DatabaseFailure::refusedRow() const noexcept
+{
+    const int primary = m_code & 0xFF;
+    return primary == SQLITE_CONSTRAINT || primary == SQLITE_TOOBIG || primary == SQLITE_MISMATCH;
+}
 
 QString namesDatabasePath(const QString& programFolder)
 {
@@ -57,9 +71,10 @@ Connection::Connection(const QString& path)
     if (rc != SQLITE_OK) {
         const QString message =
             m_db ? QString::fromUtf8(sqlite3_errmsg(m_db)) : QString::fromUtf8(sqlite3_errstr(rc));
+        const int code = m_db ? sqlite3_extended_errcode(m_db) : rc;
         sqlite3_close(m_db);
         m_db = nullptr;
-        throw Failure(message);
+        throw DatabaseFailure(message, code);
     }
     sqlite3_busy_timeout(m_db, BusyTimeoutMs);
     sqlite3_extended_result_codes(m_db, 1);
@@ -72,7 +87,12 @@ Connection::~Connection()
 
 void Connection::fail() const
 {
-    throw Failure(QString::fromUtf8(sqlite3_errmsg(m_db)));
+    fail(sqlite3_extended_errcode(m_db));
+}
+
+void Connection::fail(int code) const
+{
+    throw DatabaseFailure(QString::fromUtf8(sqlite3_errmsg(m_db)), code);
 }
 
 void Connection::execute(const char* sql)
@@ -125,8 +145,8 @@ Connection::Transaction::Transaction(Connection& connection)
 
 Connection::Transaction::~Transaction()
 {
-    if (m_open)
-        sqlite3_exec(m_connection.m_db, "commit", nullptr, nullptr, nullptr);
+    if (m_open && m_connection.inTransaction())
+        sqlite3_exec(m_connection.m_db, "rollback", nullptr, nullptr, nullptr);
 }
 
 void Connection::Transaction::commit()
@@ -138,7 +158,8 @@ void Connection::Transaction::commit()
 void Connection::Transaction::rollback()
 {
     m_open = false;
-    m_connection.execute("rollback");
+    if (m_connection.inTransaction())
+        m_connection.execute("rollback");
 }
 
 Connection::Prepared::Prepared(Connection& connection, const char* sql)
@@ -161,10 +182,11 @@ void Connection::Prepared::run(const QString& name)
     // The message first: resetting the statement is what lets it run again.
     const QString message =
         rc == SQLITE_DONE ? QString() : QString::fromUtf8(sqlite3_errmsg(m_connection.m_db));
+    const int code = rc == SQLITE_DONE ? SQLITE_OK : sqlite3_extended_errcode(m_connection.m_db);
     sqlite3_reset(m_stmt);
     sqlite3_clear_bindings(m_stmt);
     if (rc != SQLITE_DONE)
-        throw Failure(message);
+        throw DatabaseFailure(message, code);
 }
 
 QList<QByteArray> Connection::dropPlainIndexes(const char* table)

@@ -3,10 +3,26 @@
 #include <QString>
 #include <QStringList>
 
+#include "base/failure.h"
 #include "names/statements.h"
 
 struct sqlite3;
 struct sqlite3_stmt;
+
+// A failure of the database engine, with its result code: what went wrong
+// with the file or the engine, or a rule of a table that refused a row.
+class DatabaseFailure : public Failure {
+public:
+    DatabaseFailure(QString description, int code);
+
+    int code() const noexcept { return m_code; }
+    // A rule of the table refused the row (a constraint, a trigger, a value
+    // too large): the database itself is sound and the next row may pass.
+    bool refusedRow() const noexcept;
+
+private:
+    int m_code;
+};
 
 // The path of the names database in the program folder.
 QString namesDatabasePath(const QString& programFolder);
@@ -30,8 +46,9 @@ public:
     QStringList queryNames(const Sql::Query& query);
 
     // Groups many statements into one commit. A statement that fails inside
-    // it changes nothing, and the statements before it stay; the transaction
-    // commits when it ends, failure or not.
+    // it changes nothing, and the statements before it stay until the end:
+    // only commit() keeps them. A transaction that ends otherwise (a failure
+    // unwinding through it) is rolled back.
     class Transaction {
     public:
         explicit Transaction(Connection& connection);
@@ -39,7 +56,9 @@ public:
         Transaction(const Transaction&) = delete;
         Transaction& operator=(const Transaction&) = delete;
         void commit();
-        // Undoes everything since the transaction began; it ends here.
+        // Undoes everything since the transaction began; it ends here. The
+        // engine may have undone it already, after a failure of the file
+        // (full disk, I/O error): that is no second failure.
         void rollback();
 
     private:
@@ -77,6 +96,7 @@ public:
 
 private:
     [[noreturn]] void fail() const;
+    [[noreturn]] void fail(int code) const;
 
     sqlite3* m_db = nullptr;
 };

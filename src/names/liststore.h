@@ -1,10 +1,8 @@
 #pragma once
 
-// What the list buttons do to the names database, apart from any window:
-// the statement each chooses for the source and gender, the rules a name
-// must pass, and the import of a text file. The main window runs these under
-// its error traps, a step at a time; the command-line companion runs them
-// directly and stops at the first failure.
+// The pieces of the list operations (names/listoperations.h): the statement
+// each chooses for the source and gender, the rules a name must pass, and the
+// reading and storing of one text file.
 
 #include "names/database.h"
 #include "names/listchoice.h"
