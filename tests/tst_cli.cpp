@@ -171,13 +171,14 @@ private Q_SLOTS:
         QTest::addColumn<QStringList>("arguments");
         QTest::addColumn<QString>("error");
         const QStringList generate{u"generate"_s, u"-n"_s, u"3"_s};
-        QTest::newRow("missing") << u"missing"_s << generate << u"unable to open database file"_s;
-        QTest::newRow("not a database")
-            << u"corrupt"_s << QStringList{u"names"_s, u"last"_s} << u"file is not a database"_s;
-        QTest::newRow("locked, reading") << u"locked"_s << generate << u"database is locked"_s;
+        QTest::newRow("missing") << u"missing"_s << generate
+                                 << u"%1: unable to open database file"_s;
+        QTest::newRow("not a database") << u"corrupt"_s << QStringList{u"names"_s, u"last"_s}
+                                        << u"The file %1 is not a Quillane names database."_s;
+        QTest::newRow("locked, reading") << u"locked"_s << generate << u"%1: database is locked"_s;
         QTest::newRow("locked, adding")
             << u"locked"_s << QStringList{u"add"_s, u"first"_s, u"Zed"_s}
-            << u"database is locked"_s;
+            << u"%1: database is locked"_s;
     }
 
     void databaseFailures()
@@ -197,7 +198,7 @@ private Q_SLOTS:
         const Run result = run(arguments);
         QCOMPARE(result.status, 1);
         QVERIFY(result.out.isEmpty());
-        QCOMPARE(QString::fromUtf8(result.err), u"quillane-cli: %1: %2\n"_s.arg(db, error));
+        QCOMPARE(QString::fromUtf8(result.err), u"quillane-cli: %1\n"_s.arg(error.arg(db)));
         lock.reset();
         if (problem == u"locked")
             QCOMPARE(tableColumn(db, u"system_ffirstname"_s, u"Ffirst"_s).count(u"Zed"_s), 0);

@@ -7,6 +7,12 @@
 
 #include <QFile>
 #include <QTest>
+#include <QThread>
+
+#include <sqlite3.h>
+
+#include <optional>
+#include <thread>
 
 using namespace Qt::StringLiterals;
 
@@ -65,8 +71,14 @@ private Q_SLOTS:
         row("user: duplicates twice", user, u"AL,Bo,Bo,cleo"_s, u"de Vries,Yu"_s);
         row("no gender selected", noGender, kept, last);
         row("no source selected", noSource, kept, kept);
-        row("missing", both, kept, kept, u"unable to open database file"_s);
-        row("corrupt", both, kept, kept, u"file is not a database"_s);
+        // A failure names the file; one that is not ours says so.
+        const QString notOurs = u"The file %1 is not a Quillane names database."_s.arg(m_path);
+        row("missing", both, kept, kept, m_path + u": unable to open database file"_s);
+        row("corrupt", both, kept, kept, notOurs);
+        row("empty", both, kept, kept, notOurs);
+        row("foreign", user, kept, kept, notOurs);
+        // Another program writing for a moment is waited for.
+        row("busy", user, u"AL,Bo,Bo,cleo"_s, u"de Vries,Yu"_s);
     }
 
     void panesShowEachQuery()
@@ -79,6 +91,25 @@ private Q_SLOTS:
             QVERIFY(db.remove());
         if (database == "corrupt") // written over the database
             QVERIFY(db.open(QIODevice::WriteOnly) && db.write(QByteArray(999, 'x')) && db.flush());
+        if (database == "empty")
+            QVERIFY(db.resize(0));
+        if (database == "foreign") { // another program's database
+            QVERIFY(db.remove());
+            sqlite3* other = nullptr;
+            sqlite3_open(QFile::encodeName(m_path).constData(), &other);
+            QCOMPARE(sqlite3_exec(other, "create table t (x)", nullptr, nullptr, nullptr), 0);
+            sqlite3_close(other);
+        }
+        std::optional<Connection> writer;
+        std::thread release;
+        if (database == "busy") {
+            writer.emplace(m_path);
+            writer->execute("begin exclusive");
+            release = std::thread([&] {
+                QThread::msleep(300);
+                writer->execute("commit");
+            });
+        }
         NameLists lists(m_path);
         lists.firstPane().setNames({u"kept"_s});
         lists.lastPane().setNames({u"kept"_s});
@@ -88,6 +119,8 @@ private Q_SLOTS:
         } catch (const Failure& f) {
             failure = f.description();
         }
+        if (release.joinable())
+            release.join();
         QTEST(failure, "failure");
         QTEST(lists.firstPane().names().join(u','), "firstNames");
         QTEST(lists.lastPane().names().join(u','), "lastNames");

@@ -78,7 +78,7 @@ private Q_SLOTS:
                                    ClosingLine::Long);
         };
         QCOMPARE(dialogs.messages(), (QStringList{report(u"first"_s, 20), report(u"second"_s, 30),
-                                                  report(u"unable to open database file"_s, 40)}));
+                                                  report(u"/nonexistent/folder/names.mdb: unable to open database file"_s, 40)}));
     }
 };
 

@@ -59,9 +59,18 @@ private Q_SLOTS:
                             const QStringList& reports = {}, const QByteArray& other = {}) {
             QTest::newRow(tag) << files << names << reports << other;
         };
-        const QString at = u"in Tessmark.Main.FileToListview "_s, locked = u"database is locked"_s;
+        // In the reports, %1 stands for the test's folder.
+        const QString at = u"in Tessmark.Main.FileToListview "_s;
+        const QString locked = u"%1/names.mdb: database is locked"_s;
         constexpr ClosingLine Long = ClosingLine::Long;
-        QStringList refusals(ListEditor::MaxReportsPerFile, errorReportText(u"no"_s, at, 50, Long));
+        const auto refused = [&](const QString& text) {
+            return errorReportText(text, at, 50, Long);
+        };
+        const QStringList notText{errorReportText(
+            u"The file %1/0.txt is not text: it holds control characters. Nothing of it was "
+            u"stored."_s,
+            at, 40, Long)};
+        QStringList refusals(ListEditor::MaxReportsPerFile, refused(u"no"_s));
         refusals += errorReportText(u"15 more names of this file were not stored."_s, at, 60, Long);
         row("LF only, no final line end", {"Ann\nBo\nCy"}, u"Ann|Bo|Cy"_s);
         row("CR only", {"Ann\rBo\rCy\r"}, u"Ann|Bo|Cy"_s);
@@ -70,7 +79,25 @@ private Q_SLOTS:
         row("a line of spaces", {"Ann\n  \nBo"}, u"Ann|  |Bo"_s);
         row("O'Brien", {"O'Brien\n'''\n"}, u"OBrien"_s);
         row("byte-order mark", {"\xEF\xBB\xBFZo\xC3\xAB\nBo"}, u"Zoë|Bo"_s);
-        row("NUL, invalid UTF-8", {QByteArray("A\0nn\xFF\nBo", 8)}, u"Ann\uFFFD|Bo"_s);
+        row("UTF-16 with its mark", {QByteArray("\xFF\xFEZ\0o\0\xEB\0\n\0", 10)}, u"Zoë"_s);
+        // Not UTF-8: the code page such lists are saved in on Windows.
+        row("Windows-1252", {"M\xFCller\n\x80uro\nZo\xEB"}, u"Müller|€uro|Zoë"_s);
+        // A file that is not text is refused whole.
+        row("a NUL", {QByteArray("A\0nn\nBo", 7)}, u""_s, notText);
+        row("UTF-16 without its mark", {QByteArray("Z\0o\0\n\0", 6)}, u""_s, notText);
+        row("an escape", {"Ann\n\x1B[2J\nBo"}, u""_s, notText);
+        QByteArray noise(2 << 20, Qt::Uninitialized);
+        QRandomGenerator(42).fillRange(reinterpret_cast<quint32*>(noise.data()), noise.size() / 4);
+        row("random bytes", {noise}, u""_s, notText);
+        // A control character in one name, past the start of the file, or a
+        // tab: that name is refused, with the character written out.
+        const QByteArray start = QByteArray("Ann\n").repeated(17000);
+        row("a control character later", {start + "Es\x1B[2Jc\nBo"},
+            (QStringList(17000, u"Ann"_s) << u"Bo"_s).join(u'|'),
+            {refused(u"The name \"Es\\u001b[2Jc\" holds a control character and was not "
+                     u"stored."_s)});
+        row("a tab", {"Ann\tLee\nBo"}, u"Bo"_s,
+            {refused(u"The name \"Ann\\tLee\" holds a control character and was not stored."_s)});
         row("cancel", {}, u""_s);
         row("several", {"Cy\n", {}, "Ann\n", "Bo\n"}, u"Cy|Ann|Bo"_s, {u"File not found"_s});
         row("a locked database", {"Ann\n"}, u""_s,
@@ -82,12 +109,9 @@ private Q_SLOTS:
             u"Ann|Cy"_s, refusals,
             "create trigger refuse before insert on user_firstname when new.firstname = 'Bad' "
             "begin select raise(abort, 'no'); end");
-        // Read in pieces, or not text at all: the names are those of the whole
-        // file split at once, and the reports are bounded.
+        // Read in pieces: the names are those of the whole file split at
+        // once, and the reports are bounded.
         row("across reads", {QByteArray("\xC3\xAB\n").repeated(100000)}, {});
-        QByteArray noise(2 << 20, Qt::Uninitialized);
-        QRandomGenerator(42).fillRange(reinterpret_cast<quint32*>(noise.data()), noise.size() / 4);
-        row("random bytes", {noise}, {});
         row("a 20 MB line", {QByteArray(20 << 20, 'z') + "\nAfter"}, {});
     }
 
@@ -118,7 +142,7 @@ private Q_SLOTS:
         if (names.isNull())
             QVERIFY(messages.size() <= ListEditor::MaxReportsPerFile + 1);
         else
-            QCOMPARE(messages, reports);
+            QCOMPARE(messages, reports.replaceInStrings(u"%1"_s, rig.env.folder()));
         // The hourglass over the whole import, then once more over the one refresh.
         const QList<int> busy{MousePointer::Hourglass, MousePointer::Default};
         QCOMPARE(rig.pointer.history, paths.isEmpty() ? QList<int>() : busy + busy);

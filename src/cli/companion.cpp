@@ -137,9 +137,10 @@ Options:
 
 Adds the names of text files to a list as the window's "Load ... From File"
 buttons do: one name per line, in UTF-8 (or UTF-16 or UTF-32 with a
-byte-order mark), apostrophes removed, empty lines skipped. A name longer
-than 255 characters is refused; then, or on any other failure, nothing of
-any file is imported.
+byte-order mark; a file that is not UTF-8 is read as Windows-1252),
+apostrophes removed, empty lines skipped. A name longer than 255 characters
+or with a control character is refused, and so is a file that is not text;
+then, or on any other failure, nothing of any file is imported.
 
 Options:
   --list builtin|user  the built-in list (default) or your own
@@ -248,39 +249,18 @@ private:
     static QCommandLineOption listOption() { return {u"list"_s, {}, u"LIST"_s, u"builtin"_s}; }
     static QCommandLineOption genderOption() { return {u"gender"_s, {}, u"GENDER"_s, u"both"_s}; }
 
-    // Runs work against the names database; the database's failures name
-    // the file.
-    void withDatabase(const std::function<void()>& work) const
-    {
-        try {
-            work();
-        } catch (const DatabaseFailure& failure) {
-            throw Failure(inDatabase(failure.description()));
-        }
-    }
-
-    QString inDatabase(const QString& description) const
-    {
-        return u"%1: %2"_s.arg(QDir::toNativeSeparators(m_database), description);
-    }
-
     // Work over a connection of its own, in one transaction: all of it is
     // stored, or after any failure none of it.
     void inOneTransaction(const std::function<void(Connection&)>& work) const
     {
-        withDatabase([&] {
-            Connection connection(m_database);
-            Connection::Transaction transaction(connection);
-            work(connection);
-            transaction.commit();
-        });
+        Connection connection(m_database);
+        Connection::Transaction transaction(connection);
+        work(connection);
+        transaction.commit();
     }
 
     // Both panes for the choice, filled as the window fills them.
-    void fillPanes(NameLists& lists, const ListChoice& choice) const
-    {
-        withDatabase([&] { lists.RefreshLists(choice); });
-    }
+    void fillPanes(NameLists& lists, const ListChoice& choice) const { lists.RefreshLists(choice); }
 
     void write(const QByteArray& bytes) const
     {
@@ -426,10 +406,8 @@ int Command::add()
     const ListChoice list = choice(false);
     const QStringList typed = m_parser.positionalArguments().mid(1);
     std::optional<Connection> connection;
-    withDatabase([&] {
-        addNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list,
-                 typed, BlankNames::Refuse);
-    });
+    addNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list, typed,
+             BlankNames::Refuse);
     return Companion::Done;
 }
 
@@ -443,10 +421,8 @@ int Command::remove()
         usage(u"Your own list is emptied as a whole: use 'quillane-cli clear'."_s, m_name);
     const QStringList names = m_parser.positionalArguments().mid(1);
     std::optional<Connection> connection;
-    withDatabase([&] {
-        deleteNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list,
-                    names, AbsentNames::Refuse);
-    });
+    deleteNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list, names,
+                AbsentNames::Refuse);
     return Companion::Done;
 }
 
@@ -455,10 +431,8 @@ int Command::clear()
     if (!parse({}, 1, 1))
         return Companion::Done;
     const ListKind which = kind();
-    withDatabase([&] {
-        Connection connection(m_database);
-        clearList(connection, which);
-    });
+    Connection connection(m_database);
+    clearList(connection, which);
     return Companion::Done;
 }
 
@@ -486,7 +460,7 @@ int Command::import()
                                        throw Failure(u"%1: %2"_s.arg(problem.description, path));
                                    throw Failure(u"%1: %2"_s.arg(path, problem.description));
                                case ImportCulprit::Database:
-                                   throw Failure(inDatabase(problem.description));
+                                   throw Failure(problem.description);
                                }
                            });
         }

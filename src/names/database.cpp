@@ -14,14 +14,41 @@ namespace {
 // instead of leaving the window hanging.
 constexpr int BusyTimeoutMs = 2000;
 
+// A rule of the table refused the row: a constraint, a trigger, a value too
+// large. The database itself is sound.
+bool isRowRefusal(int code)
+{
+    const int primary = code & 0xFF;
+    return primary == SQLITE_CONSTRAINT || primary == SQLITE_TOOBIG || primary == SQLITE_MISMATCH;
+}
+
+// What the user reads of an engine failure. A failure of the file names it;
+// a file that opens but lacks the lists is not ours; a row that a rule of its
+// table refused is about the row, and says so in the rule's own words.
+[[noreturn]] void throwEngineFailure(const QString& path, int code, const QString& message)
+{
+    const QString file = QDir::toNativeSeparators(path);
+    const int primary = code & 0xFF;
+    if (primary == SQLITE_NOTADB || message.startsWith(u"no such table:")
+        || message.startsWith(u"no such column:"))
+        throw DatabaseFailure(u"The file %1 is not a Quillane names database."_s.arg(file), code);
+    if (isRowRefusal(code))
+        throw DatabaseFailure(message, code);
+    throw DatabaseFailure(u"%1: %2"_s.arg(file, message), code);
+}
+
+[[noreturn]] void throwEngineFailure(const QString& path, sqlite3* db)
+{
+    throwEngineFailure(path, sqlite3_extended_errcode(db), QString::fromUtf8(sqlite3_errmsg(db)));
+}
+
 // A prepared statement, finalised on every path out.
 class Statement {
 public:
-    Statement(sqlite3* db, const char* sql)
+    Statement(sqlite3* db, const QString& path, const char* sql)
     {
         if (sqlite3_prepare_v2(db, sql, -1, &m_stmt, nullptr) != SQLITE_OK)
-            throw DatabaseFailure(QString::fromUtf8(sqlite3_errmsg(db)),
-                                  sqlite3_extended_errcode(db));
+            throwEngineFailure(path, db);
     }
     ~Statement() { sqlite3_finalize(m_stmt); }
     Statement(const Statement&) = delete;
@@ -33,16 +60,14 @@ private:
     sqlite3_stmt* m_stmt = nullptr;
 };
 
-int columnIndex(sqlite3_stmt* stmt, const char* name)
+int columnIndex(sqlite3_stmt* stmt, const QString& path, const char* name)
 {
     const int count = sqlite3_column_count(stmt);
     for (int i = 0; i < count; ++i) {
         if (sqlite3_stricmp(sqlite3_column_name(stmt, i), name) == 0)
             return i;
     }
-    throw DatabaseFailure(u"Item cannot be found in the collection corresponding to the "
-                          "requested name or ordinal: %1"_s.arg(QString::fromUtf8(name)),
-                          SQLITE_ERROR);
+    throwEngineFailure(path, SQLITE_ERROR, u"no such column: %1"_s.arg(QString::fromUtf8(name)));
 }
 
 } // namespace
@@ -55,8 +80,12 @@ DatabaseFailure::DatabaseFailure(QString description, int code)
 
 bool DatabaseFailure::refusedRow() const noexcept
 {
-    const int primary = m_code & 0xFF;
-    return primary == SQLITE_CONSTRAINT || primary == SQLITE_TOOBIG || primary == SQLITE_MISMATCH;
+    return isRowRefusal(m_code);
+}
+
+const QString& Connection::path() const
+{
+    return m_path;
 }
 
 QString namesDatabasePath(const QString& programFolder)
@@ -65,6 +94,7 @@ QString namesDatabasePath(const QString& programFolder)
 }
 
 Connection::Connection(const QString& path)
+    : m_path(path)
 {
     const QByteArray file = QFile::encodeName(path);
     const int rc = sqlite3_open_v2(file.constData(), &m_db, SQLITE_OPEN_READWRITE, nullptr);
@@ -74,8 +104,9 @@ Connection::Connection(const QString& path)
         const int code = m_db ? sqlite3_extended_errcode(m_db) : rc;
         sqlite3_close(m_db);
         m_db = nullptr;
-        throw DatabaseFailure(message, code);
+        throwEngineFailure(path, code, message);
     }
+    // Before any statement: reading the lists' definitions waits too.
     sqlite3_busy_timeout(m_db, BusyTimeoutMs);
     sqlite3_extended_result_codes(m_db, 1);
 }
@@ -92,19 +123,19 @@ void Connection::fail() const
 
 void Connection::fail(int code) const
 {
-    throw DatabaseFailure(QString::fromUtf8(sqlite3_errmsg(m_db)), code);
+    throwEngineFailure(m_path, code, QString::fromUtf8(sqlite3_errmsg(m_db)));
 }
 
 void Connection::execute(const char* sql)
 {
-    Statement stmt(m_db, sql);
+    Statement stmt(m_db, m_path, sql);
     if (sqlite3_step(stmt.get()) != SQLITE_DONE)
         fail();
 }
 
 void Connection::execute(const char* sql, const QString& name)
 {
-    Statement stmt(m_db, sql);
+    Statement stmt(m_db, m_path, sql);
     const QByteArray utf8 = name.toUtf8();
     sqlite3_bind_text(stmt.get(), 1, utf8.constData(), int(utf8.size()), SQLITE_STATIC);
     if (sqlite3_step(stmt.get()) != SQLITE_DONE)
@@ -123,8 +154,8 @@ int Connection::changes() const
 
 QStringList Connection::queryNames(const Sql::Query& query)
 {
-    Statement stmt(m_db, query.text);
-    const int column = columnIndex(stmt.get(), query.column);
+    Statement stmt(m_db, m_path, query.text);
+    const int column = columnIndex(stmt.get(), m_path, query.column);
     QStringList names;
     int rc;
     while ((rc = sqlite3_step(stmt.get())) == SQLITE_ROW) {
@@ -186,7 +217,7 @@ void Connection::Prepared::run(const QString& name)
     sqlite3_reset(m_stmt);
     sqlite3_clear_bindings(m_stmt);
     if (rc != SQLITE_DONE)
-        throw DatabaseFailure(message, code);
+        throwEngineFailure(m_connection.m_path, code, message);
 }
 
 QList<QByteArray> Connection::dropPlainIndexes(const char* table)
@@ -194,8 +225,9 @@ QList<QByteArray> Connection::dropPlainIndexes(const char* table)
     QList<QByteArray> names;
     QList<QByteArray> rebuild;
     {
-        Statement stmt(m_db, "select name, sql from sqlite_master where type = 'index' "
-                             "and tbl_name = ? and sql is not null");
+        Statement stmt(m_db, m_path,
+                       "select name, sql from sqlite_master where type = 'index' "
+                       "and tbl_name = ? and sql is not null");
         sqlite3_bind_text(stmt.get(), 1, table, -1, SQLITE_STATIC);
         int rc;
         while ((rc = sqlite3_step(stmt.get())) == SQLITE_ROW) {

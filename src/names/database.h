@@ -10,7 +10,8 @@ struct sqlite3;
 struct sqlite3_stmt;
 
 // A failure of the database engine, with its result code: what went wrong
-// with the file or the engine, or a rule of a table that refused a row.
+// with the file or the engine (its description names the file), or a rule of
+// a table that refused a row (its description is the rule's).
 class DatabaseFailure : public Failure {
 public:
     DatabaseFailure(QString description, int code);
@@ -30,7 +31,7 @@ QString namesDatabasePath(const QString& programFolder);
 // One connection to the names database, open for reading and writing for the
 // length of one operation and closed on every path out. It never creates the
 // file: a missing database is a failure, like every other engine failure,
-// and carries the engine's own message.
+// and carries the engine's own message after the file's name.
 class Connection {
 public:
     explicit Connection(const QString& path);
@@ -93,10 +94,12 @@ public:
     int changes() const;
 
     sqlite3* handle() const { return m_db; }
+    const QString& path() const;
 
 private:
     [[noreturn]] void fail() const;
     [[noreturn]] void fail(int code) const;
 
+    QString m_path;
     sqlite3* m_db = nullptr;
 };

@@ -3,6 +3,8 @@
 #include "base/failure.h"
 #include "base/programfiles.h"
 
+#include <QDir>
+
 #include <optional>
 
 using namespace Qt::StringLiterals;
@@ -90,12 +92,23 @@ void deleteNames(const ConnectionSource& connect, ListKind kind, const ListChoic
     for (const QString& name : names) {
         int deleted = 0;
         for (const char* sql : deletes) {
-            run(sql, [&] {
+            bool databaseFailed = false;
+            const bool done = run(sql, [&] {
                 if (name.isNull())
                     throw Failure(u"No name is selected in the list."_s);
-                connection->execute(sql, name);
+                try {
+                    connection->execute(sql, name);
+                } catch (const DatabaseFailure& failure) {
+                    databaseFailed = !failure.refusedRow();
+                    throw;
+                }
                 deleted += connection->changes();
             });
+            // After a failure of the database itself the rest is not tried:
+            // the engine may have undone the transaction, and what followed
+            // would run outside of it. The transaction is rolled back.
+            if (!done && (databaseFailed || !connection->inTransaction()))
+                return;
         }
         if (deleted == 0 && absent == AbsentNames::Refuse)
             throw Failure(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
@@ -116,15 +129,37 @@ void importNameFile(const ConnectionSource& connect, const QString& path, ListKi
     const auto report = [&](ImportStep step, ImportCulprit culprit, const QString& text) {
         problems(ImportProblem{step, culprit, text});
     };
+    std::optional<NameFileImport> import;
+    // Ends the file's import: nothing of it stays (or, joined to the caller's
+    // transaction, the caller decides), and the one report says why.
+    const auto end = [&](ImportStep step, ImportCulprit culprit, const QString& text) {
+        if (import) {
+            try {
+                import->rollback();
+            } catch (...) {
+                // The connection closes next, which undoes it all the same.
+            }
+        }
+        report(step, culprit, text);
+    };
     // Runs one step of the import; a failure is reported and ends the step.
+    // A failure of the database itself also ends the import at once: the
+    // engine may already have undone the transaction, and going on would
+    // store the rest of the file name by name, outside of any.
     const auto attempt = [&](ImportStep step, const auto& work) {
         try {
             work();
             return true;
+        } catch (const DatabaseFailure& failure) {
+            end(step, ImportCulprit::Database, failure.description());
         } catch (...) {
-            report(step, culpritAt(step), describeCurrentException());
-            return false;
+            const ImportCulprit culprit = culpritAt(step);
+            if (culprit == ImportCulprit::File)
+                report(step, culprit, describeCurrentException());
+            else
+                end(step, culprit, describeCurrentException());
         }
+        return false;
     };
 
     if (!FileExists(path)) {
@@ -135,7 +170,6 @@ void importNameFile(const ConnectionSource& connect, const QString& path, ListKi
     Connection* connection = nullptr;
     if (!attempt(ImportStep::OpenDatabase, [&] { connection = &connect(); }))
         return;
-    std::optional<NameFileImport> import;
     if (!attempt(ImportStep::OpenFile, [&] {
             import.emplace(*connection, path, insert);
             import->openFile();
@@ -154,22 +188,46 @@ void importNameFile(const ConnectionSource& connect, const QString& path, ListKi
     while (reading) {
         names.clear();
         reading = false;
-        attempt(ImportStep::Read, [&] { reading = import->readNames(names); });
+        if (!attempt(ImportStep::Read, [&] { reading = import->readNames(names); })
+            && !connection->inTransaction())
+            return;
+        if (!import->isText()) {
+            end(ImportStep::Read, ImportCulprit::File,
+                u"The file %1 is not text: it holds control characters. Nothing of it was "
+                "stored."_s.arg(import->fileName()));
+            return;
+        }
         for (const NameSplitter::Name& name : names) {
+            QString reason;
             try {
                 import->store(name);
+                continue;
+            } catch (const DatabaseFailure& failure) {
+                // Only a name that a rule of the table refused leaves the
+                // database as it was, the transaction still open.
+                if (!failure.refusedRow()) {
+                    end(ImportStep::Store, ImportCulprit::Database, failure.description());
+                    return;
+                }
+                if (!connection->inTransaction()) {
+                    end(ImportStep::Store, ImportCulprit::Database,
+                        u"%1: %2"_s.arg(QDir::toNativeSeparators(connection->path()),
+                                        failure.description()));
+                    return;
+                }
+                reason = failure.description();
             } catch (...) {
-                // Past the bound the names are still tried, and the rest counted.
-                if (++refused <= MaxImportReportsPerFile)
-                    report(ImportStep::Store, ImportCulprit::Name, describeCurrentException());
+                reason = describeCurrentException();
             }
+            // Past the bound the names are still tried, and the rest counted.
+            if (++refused <= MaxImportReportsPerFile)
+                report(ImportStep::Store, ImportCulprit::Name, reason);
         }
     }
     if (refused > MaxImportReportsPerFile)
         report(ImportStep::MoreRefused, ImportCulprit::Name,
                moreRejected(refused - MaxImportReportsPerFile));
-    // Should an index fail to build, the names are kept all the same: the
-    // panes are then slower to fill, never wrong.
-    attempt(ImportStep::RebuildIndexes, [&] { import->rebuildIndexes(); });
+    if (!attempt(ImportStep::RebuildIndexes, [&] { import->rebuildIndexes(); }))
+        return;
     attempt(ImportStep::Commit, [&] { import->commit(); });
 }
