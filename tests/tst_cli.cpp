@@ -128,6 +128,14 @@ private Q_SLOTS:
             << QStringList{u"add"_s, u"last"_s, u"Lee"_s, tooLong} << 1
             << u"quillane-cli: The name \"%1...\" is longer than 255 characters and was not "
                u"stored."_s.arg(tooLong.left(40));
+        QTest::newRow("control character")
+            << QStringList{u"add"_s, u"last"_s, u"Lee"_s, u"Evil\nInjected"_s} << 1
+            << u"quillane-cli: The name \"Evil\\nInjected\" holds a control character and was "
+               u"not stored."_s;
+        QTest::newRow("a file that is not text")
+            << QStringList{u"import"_s, u"last"_s, u"%1/good.txt"_s, u"%1/names.mdb"_s} << 1
+            << u"quillane-cli: The file %1/names.mdb is not text: it holds control characters. "
+               u"Nothing of it was stored."_s;
         QTest::newRow("name not in the list")
             << QStringList{u"delete"_s, u"last"_s, u"SMITH"_s, u"Quillonne"_s} << 1
             << u"quillane-cli: \"Quillonne\" is not in the list: nothing was deleted."_s;

@@ -57,6 +57,11 @@ private Q_SLOTS:
         QTest::newRow("add: empty") << Click{User, 2, u""_s};
         QTest::newRow("add: spaces only") << Click{User, 5, u"   "_s};
         QTest::newRow("add: apostrophes only") << Click{User, 2, u"'''"_s};
+        // Only spaces make a reply blank; a control character is refused.
+        QTest::newRow("add: a no-break space")
+            << Click{User, 5, u"\u00A0"_s, {ul}, u"\u00A0"_s, true};
+        QTest::newRow("add: a tab") << Click{User, 2, u"\t"_s, {}, {}, false, {30}};
+        QTest::newRow("add: a line break") << Click{User, 5, u"Ann\nLee"_s, {}, {}, false, {30}};
         QTest::newRow("add: spaces kept") << Click{User, 2, lee, {uf}, lee, true};
         QTest::newRow("add: apostrophes out") << Click{User, 5, on, {ul}, u"oNeil"_s, true};
         QTest::newRow("add: built-in, Male Only") << Click{MaleOnly, 2, nq, {f}, nq, false};

@@ -456,9 +456,10 @@ int Command::import()
                                    reports.append(u"%1: %2"_s.arg(path, problem.description));
                                    return;
                                case ImportCulprit::File:
+                                   // The other reports name the file themselves.
                                    if (problem.step == ImportStep::FindFile)
                                        throw Failure(u"%1: %2"_s.arg(problem.description, path));
-                                   throw Failure(u"%1: %2"_s.arg(path, problem.description));
+                                   throw Failure(problem.description);
                                case ImportCulprit::Database:
                                    throw Failure(problem.description);
                                }
