@@ -82,11 +82,15 @@ using ImportProblems = std::function<void(const ImportProblem&)>;
 
 // FileToListview's work: the names of one text file (see NameSplitter) into
 // the list that the kind and the source choose, in file order. A file that is
-// not there is reported and nothing else happens. The names of the file are
-// committed together, once it has been read to its end; refused names are
-// reported, at most MaxImportReportsPerFile of them and then once how many
-// more there were. Over a connection with a transaction already open, the
-// import joins it and leaves its end to the caller, so that several files
-// stand or fall together. Never throws but for what `problems` throws.
+// not there is reported and nothing else happens; a file that is not text is
+// refused whole. The names of the file are committed together, once it has
+// been read to its end; names that a list does not store, or that a rule of
+// the table refuses, are reported, at most MaxImportReportsPerFile of them
+// and then once how many more there were, and the rest is stored. A failure
+// of the database itself (full disk, I/O error, read-only or locked file)
+// ends the import at once with one report, and nothing of the file stays.
+// Over a connection with a transaction already open, the import joins it and
+// leaves its end to the caller, so that several files stand or fall together.
+// Never throws but for what `problems` throws.
 void importNameFile(const ConnectionSource& connect, const QString& path, ListKind kind,
                     const ListChoice& choice, const ImportProblems& problems);
