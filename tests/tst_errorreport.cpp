@@ -5,7 +5,6 @@
 #include "base/trap.h"
 #include "names/namelists.h"
 #include "support/fakedialogs.h"
-#include "support/fakepointer.h"
 
 #include <QProcess>
 #include <QTest>
@@ -51,8 +50,7 @@ private Q_SLOTS:
     void aTrapReportsEachFailingStepAndGoesOn()
     {
         FakeDialogs dialogs;
-        FakePointer pointer;
-        NameLists lists(u"/nonexistent/folder/names.mdb"_s, pointer);
+        NameLists lists(u"/nonexistent/folder/names.mdb"_s);
         QStringList ran;
         int turns = 0;
         Trap trap(dialogs, u"in Tessmark.Form1.PushButton8_Click "_s, ClosingLine::Long);
@@ -72,7 +70,7 @@ private Q_SLOTS:
                                    ClosingLine::Long);
         };
         QCOMPARE(dialogs.messages(), (QStringList{report(u"first"_s, 20), report(u"second"_s, 30),
-                                                  report(u"unable to open database file"_s, 40)}));
+                                                  report(u"/nonexistent/folder/names.mdb: unable to open database file"_s, 40)}));
     }
 
     void cliComplaintsShowControlCharactersEscaped_data()

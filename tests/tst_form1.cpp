@@ -318,8 +318,9 @@ private Q_SLOTS:
     {
         QTest::addColumn<QByteArray>("content"); // of names.mdb; empty: no file
         QTest::addColumn<QString>("description");
-        QTest::newRow("missing") << QByteArray() << u"unable to open database file"_s;
-        QTest::newRow("corrupt") << QByteArray(4096, 'x') << u"file is not a database"_s;
+        QTest::newRow("missing") << QByteArray() << u"%1: unable to open database file"_s;
+        QTest::newRow("corrupt") << QByteArray(4096, 'x')
+                                 << u"The file %1 is not a Quillane names database."_s;
     }
 
     // Start-up fails before the window is shown; the whole program then
@@ -336,7 +337,7 @@ private Q_SLOTS:
         QVERIFY(!form.isVisible());
         // The whole program shows the failure's description in its notice.
         QCOMPARE(runSelf({u"--start-program-in"_s, env.folder()}),
-                 u"notice: Quillane|%1\nexit 1"_s.arg(description));
+                 u"notice: Quillane|%1\nexit 1"_s.arg(description.arg(env.databasePath())));
     }
 };
 

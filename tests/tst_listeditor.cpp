@@ -58,6 +58,17 @@ private Q_SLOTS:
         QTest::newRow("add: spaces only") << Click{.choice = User, .button = 5, .input = u"   "_s};
         QTest::newRow("add: apostrophes only")
             << Click{.choice = User, .button = 2, .input = u"'''"_s};
+        // Only spaces make a reply blank; a control character is refused.
+        QTest::newRow("add: a no-break space") << Click{.choice = User,
+                                                        .button = 5,
+                                                        .input = u"\u00A0"_s,
+                                                        .tables = {ul},
+                                                        .stored = u"\u00A0"_s,
+                                                        .shown = true};
+        QTest::newRow("add: a tab")
+            << Click{.choice = User, .button = 2, .input = u"\t"_s, .reports = {30}};
+        QTest::newRow("add: a line break")
+            << Click{.choice = User, .button = 5, .input = u"Ann\nLee"_s, .reports = {30}};
         QTest::newRow("add: spaces kept") << Click{.choice = User,
                                                    .button = 2,
                                                    .input = lee,
@@ -103,7 +114,7 @@ private Q_SLOTS:
         // A name in every table twice, as an older database may hold it: a delete takes both.
         for (qsizetype t = 0; t < Tables.size() && !c.noDatabase; ++t)
             insertRows(db, Tables[t], Columns[t], {u"O'Quill"_s, u"O'Quill"_s});
-        NameLists lists(db, pointer);
+        NameLists lists(db);
         lists.RefreshLists(c.choice);
         pointer.history.clear();
         ListEditor editor(env.dialogs, db, lists, pointer, [&] { return c.choice; });

@@ -162,7 +162,8 @@ private Q_SLOTS:
     {
         TestEnvironment env;
         QCOMPARE(runSelf({u"--click-option-after-breaking-database"_s, env.folder()}),
-                 u"notice: Quillane|file is not a database\nexit 1"_s);
+                 u"notice: Quillane|The file %1 is not a Quillane names database.\nexit 1"_s.arg(
+                     env.databasePath()));
     }
 };
 

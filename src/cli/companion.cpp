@@ -2,12 +2,11 @@
 
 #include "base/clock.h"
 #include "base/failure.h"
-#include "base/pointer.h"
 #include "base/programfiles.h"
 #include "generate/generation.h"
 #include "generate/randomsource.h"
 #include "names/database.h"
-#include "names/liststore.h"
+#include "names/listoperations.h"
 #include "names/namelists.h"
 #include "results/resultsfile.h"
 #include "results/resultsmodel.h"
@@ -42,13 +41,6 @@ struct UsageProblem {
 {
     throw UsageProblem{message, command};
 }
-
-// A failure whose text says all there is to say: it names its own file, or
-// is about the command's input rather than the database it runs against.
-class Refusal : public Failure {
-public:
-    using Failure::Failure;
-};
 
 const char GeneralHelp[] = R"(Usage: quillane-cli [--database FILE] COMMAND [OPTIONS]
 
@@ -146,9 +138,10 @@ Options:
 
 Adds the names of text files to a list as the window's "Load ... From File"
 buttons do: one name per line, in UTF-8 (or UTF-16 or UTF-32 with a
-byte-order mark), apostrophes removed, empty lines skipped. A name longer
-than 255 characters is refused; then, or on any other failure, nothing of
-any file is imported.
+byte-order mark; a file that is not UTF-8 is read as Windows-1252),
+apostrophes removed, empty lines skipped. A name longer than 255 characters
+or with a control character is refused, and so is a file that is not text;
+then, or on any other failure, nothing of any file is imported.
 
 Options:
   --list builtin|user  the built-in list (default) or your own
@@ -162,13 +155,6 @@ enum class Format { Text, Lines, Csv, Workbook2, Workbook1 };
 const std::map<QString, Format> Formats = {
     {u"text"_s, Format::Text},       {u"lines"_s, Format::Lines},     {u"csv"_s, Format::Csv},
     {u"xlsx2"_s, Format::Workbook2}, {u"xlsx1"_s, Format::Workbook1},
-};
-
-// Long operations show no pointer here.
-class NoPointer : public PointerOwner {
-public:
-    int mousePointer() const override { return MousePointer::Default; }
-    void setMousePointer(int) override {}
 };
 
 class Command {
@@ -264,41 +250,18 @@ private:
     static QCommandLineOption listOption() { return {u"list"_s, {}, u"LIST"_s, u"builtin"_s}; }
     static QCommandLineOption genderOption() { return {u"gender"_s, {}, u"GENDER"_s, u"both"_s}; }
 
-    // Runs work against the names database; its failures name the file.
-    void withDatabase(const std::function<void()>& work) const
-    {
-        try {
-            work();
-        } catch (const Refusal&) {
-            throw;
-        } catch (const Failure& failure) {
-            throw Failure(
-                u"%1: %2"_s.arg(QDir::toNativeSeparators(m_database), failure.description()));
-        }
-    }
-
     // Work over a connection of its own, in one transaction: all of it is
     // stored, or after any failure none of it.
     void inOneTransaction(const std::function<void(Connection&)>& work) const
     {
-        withDatabase([&] {
-            Connection connection(m_database);
-            Connection::Transaction transaction(connection);
-            try {
-                work(connection);
-            } catch (...) {
-                transaction.rollback();
-                throw;
-            }
-            transaction.commit();
-        });
+        Connection connection(m_database);
+        Connection::Transaction transaction(connection);
+        work(connection);
+        transaction.commit();
     }
 
     // Both panes for the choice, filled as the window fills them.
-    void fillPanes(NameLists& lists, const ListChoice& choice) const
-    {
-        withDatabase([&] { lists.RefreshLists(choice); });
-    }
+    void fillPanes(NameLists& lists, const ListChoice& choice) const { lists.RefreshLists(choice); }
 
     void write(const QByteArray& bytes) const
     {
@@ -376,8 +339,7 @@ int Command::generate()
     if (workbook && output.isEmpty())
         usage(u"A workbook is written to a file: give -o FILE."_s, m_name);
 
-    NoPointer pointer;
-    NameLists lists(m_database, pointer);
+    NameLists lists(m_database);
     fillPanes(lists, list);
     const QString refusal =
         refusalBeforeStart(count, lists.firstPane().count(), lists.lastPane().count());
@@ -422,8 +384,7 @@ int Command::names()
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(true);
-    NoPointer pointer;
-    NameLists lists(m_database, pointer);
+    NameLists lists(m_database);
     fillPanes(lists, list);
     const PaneModel& pane = which == ListKind::FirstNames ? lists.firstPane() : lists.lastPane();
     QByteArray bytes;
@@ -441,18 +402,10 @@ int Command::add()
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(false);
-    // Every name is checked before the database is touched.
-    QStringList stored;
-    for (const QString& typed : m_parser.positionalArguments().mid(1)) {
-        const QString name = nameToStore(typed, list);
-        if (name.isEmpty())
-            throw Failure(u"The name \"%1\" is blank: nothing was added."_s.arg(typed));
-        stored.append(name);
-    }
-    inOneTransaction([&](Connection& connection) {
-        for (const QString& name : std::as_const(stored))
-            connection.execute(insertStatement(which, list), name);
-    });
+    const QStringList typed = m_parser.positionalArguments().mid(1);
+    std::optional<Connection> connection;
+    addNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list, typed,
+             BlankNames::Refuse);
     return Companion::Done;
 }
 
@@ -464,17 +417,10 @@ int Command::remove()
     const ListChoice list = choice(true);
     if (list.user)
         usage(u"Your own list is emptied as a whole: use 'quillane-cli clear'."_s, m_name);
-    inOneTransaction([&](Connection& connection) {
-        for (const QString& name : m_parser.positionalArguments().mid(1)) {
-            int deleted = 0;
-            for (const char* sql : builtInDeletes(which, list)) {
-                connection.execute(sql, name);
-                deleted += connection.changes();
-            }
-            if (deleted == 0)
-                throw Refusal(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
-        }
-    });
+    const QStringList names = m_parser.positionalArguments().mid(1);
+    std::optional<Connection> connection;
+    deleteNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list, names,
+                AbsentNames::Refuse);
     return Companion::Done;
 }
 
@@ -483,7 +429,8 @@ int Command::clear()
     if (!parse({}, 1, 1))
         return Companion::Done;
     const ListKind which = kind();
-    inOneTransaction([&](Connection& connection) { connection.execute(clearStatement(which)); });
+    Connection connection(m_database);
+    clearList(connection, which);
     return Companion::Done;
 }
 
@@ -494,44 +441,30 @@ int Command::import()
     const ListKind which = kind();
     const ListChoice list = choice(false);
     const QStringList paths = m_parser.positionalArguments().mid(1);
-    for (const QString& path : paths) {
-        if (!FileExists(path))
-            throw Failure(u"File not found: %1"_s.arg(path));
-    }
 
-    // The files stand or fall together: one transaction holds them all.
+    // The files stand or fall together: one transaction holds them all, and
+    // the first file that cannot be read, or any refused name, ends it.
     inOneTransaction([&](Connection& connection) {
         QStringList reports;
         for (const QString& path : paths) {
-            NameFileImport import(connection, path, insertStatement(which, list));
-            try {
-                import.openFile();
-            } catch (const Failure& failure) {
-                throw Refusal(u"%1: %2"_s.arg(path, failure.description()));
-            }
-            import.begin();
-            int rejected = 0;
-            std::vector<NameSplitter::Name> names;
-            bool reading = true;
-            while (reading) {
-                names.clear();
-                reading = import.readNames(names);
-                for (const NameSplitter::Name& name : names) {
-                    try {
-                        import.store(name);
-                    } catch (const Failure& failure) {
-                        if (++rejected <= MaxImportReportsPerFile)
-                            reports.append(u"%1: %2"_s.arg(path, failure.description()));
-                    }
-                }
-            }
-            if (rejected > MaxImportReportsPerFile)
-                reports.append(
-                    u"%1: %2"_s.arg(path, moreRejected(rejected - MaxImportReportsPerFile)));
-            import.rebuildIndexes();
+            importNameFile([&]() -> Connection& { return connection; }, path, which, list,
+                           [&](const ImportProblem& problem) {
+                               switch (problem.culprit) {
+                               case ImportCulprit::Name:
+                                   reports.append(u"%1: %2"_s.arg(path, problem.description));
+                                   return;
+                               case ImportCulprit::File:
+                                   // The other reports name the file themselves.
+                                   if (problem.step == ImportStep::FindFile)
+                                       throw Failure(u"%1: %2"_s.arg(problem.description, path));
+                                   throw Failure(problem.description);
+                               case ImportCulprit::Database:
+                                   throw Failure(problem.description);
+                               }
+                           });
         }
         if (!reports.isEmpty())
-            throw Refusal(reports.join(u"\n"_s) + u" Nothing was imported."_s);
+            throw Failure(reports.join(u"\n"_s) + u" Nothing was imported."_s);
     });
     return Companion::Done;
 }
