@@ -3,6 +3,7 @@
 #include "base/failure.h"
 #include "base/shell.h"
 #include "results/resultrows.h"
+#include "results/workbookcache.h"
 
 #include <QDateTime>
 #include <QDir>
@@ -223,6 +224,7 @@ SpreadsheetApplication::SpreadsheetApplication(Shell& shell, QString folder)
 {
     if (!QDir().mkpath(m_folder))
         throw Failure(u"The folder %1 could not be made"_s.arg(QDir::toNativeSeparators(m_folder)));
+    removeOldWorkbooks(m_folder, QDateTime::currentDateTime());
 }
 
 SpreadsheetApplication::~SpreadsheetApplication() = default;
