@@ -47,8 +47,18 @@ case "$mode" in
     run) exec "$build/bin/quillane" ;;
     build) exit 0 ;;
     package)
-        rm -f "$build"/quillane_*.deb
-        (cd "$build" && cpack -G DEB)
+        # cpack's install writes the build's install_manifest.txt, which is
+        # the record of an install of your own (and what removing it reads):
+        # it is put back as it was.
+        manifest="$build/install_manifest.txt"
+        saved="$build/install_manifest.txt.saved"
+        rm -f "$saved" "$build"/quillane_*.deb
+        [ ! -e "$manifest" ] || mv "$manifest" "$saved"
+        status=0
+        (cd "$build" && cpack -G DEB) || status=$?
+        rm -f "$manifest"
+        [ ! -e "$saved" ] || mv "$saved" "$manifest"
+        [ "$status" -eq 0 ] || exit "$status"
         ls "$build"/quillane_*.deb
         exit 0 ;;
 esac

@@ -571,9 +571,9 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
                 return Done;
             }
             if (option == u"--version") {
-                const QString where = database.isEmpty()
-                                          ? describeNamesDatabase(chooseNamesDatabase(programFolder))
-                                          : u"names database: "_s + database;
+                const QString where =
+                    database.isEmpty() ? describeNamesDatabase(chooseNamesDatabase(programFolder))
+                                       : u"names database: "_s + database;
                 std::fputs(qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'
                                           + where + u'\n'),
                            out);
