@@ -30,7 +30,7 @@ packages=(
     # for the headless tests and the reading back of saved workbooks
     xvfb xauth dbus python3-openpyxl
     # for the package (dpkg-shlibdeps, file) and for checking what it holds
-    dpkg-dev file lintian appstream desktop-file-utils
+    dpkg-dev file lintian appstream desktop-file-utils bash-completion
     # for scripts/fuzz.sh (libFuzzer)
     clang libclang-rt-14-dev
 )

@@ -175,6 +175,37 @@ foreach(option IN LISTS options)
         fail("The bash completion does not offer ${option}")
     endif()
 endforeach()
+# What the shell offers after a few command lines.
+set(bash_completion /usr/share/bash-completion/bash_completion)
+if(EXISTS "${bash_completion}")
+    # (no semicolons: CMake would take them for list separators)
+    set(script [=[
+        source "$1"
+        source "$2"
+        offer() {
+            COMP_LINE=$1
+            COMP_POINT=${#COMP_LINE}
+            read -ra COMP_WORDS <<<"$1"
+            [[ $1 == *" " ]] && COMP_WORDS+=("")
+            COMP_CWORD=$((${#COMP_WORDS[@]} - 1))
+            COMPREPLY=()
+            _quillane_cli
+            echo "${COMPREPLY[*]}"
+        }
+        offer "quillane-cli g"
+        offer "quillane-cli --database x.mdb a"
+        offer "quillane-cli generate --format "
+        offer "quillane-cli add "
+        offer "quillane-cli names first --gender f"
+    ]=])
+    run(offered bash -c "${script}" bash "${bash_completion}"
+        "${root}/usr/share/bash-completion/completions/quillane-cli")
+    set(wanted "generate\nadd\ntext lines csv xlsx2 xlsx1\nfirst last\nfemale\n")
+    if(NOT offered STREQUAL wanted)
+        fail("The bash completion offers:\n${offered}")
+    endif()
+endif()
+
 string(REGEX MATCHALL "[^\n]+" lines "${helps}")
 foreach(line IN LISTS lines)
     string(FIND "${manual}" "${line}" at)
@@ -247,6 +278,14 @@ expect_done(data "${cli}" --version)
 if(NOT out MATCHES "names database: ${copy} \\(your own copy of /")
     fail("--version does not name the user's copy:\n${out}")
 endif()
+
+# A copy that cannot be made is one line naming it, and changes nothing.
+file(WRITE "${user_dir}/blocked" "in the way")
+as_user(blocked/data status out "${cli}" add first Quillon --list user)
+if(NOT status EQUAL 1 OR NOT out MATCHES "^quillane-cli: [^\n]*${user_dir}/blocked/data/quillane/names.mdb[^\n]*\n$")
+    fail("A copy that cannot be made gave (${status}):\n${out}")
+endif()
+expect_unchanged("${folder}/names.mdb" "${shipped_sum}")
 
 # The window, started for the first time: it is still up when the test
 # ends it, has said nothing, and has made the user's copy of the shipped
