@@ -7,6 +7,15 @@
 # bin/names.mdb with whatever names were added to it while developing:
 # package-config.cmake tells the install rules that a package is being made.
 
+# The hardening Debian builds its own packages with, for every build, so
+# that the package's programs are the ones the tests ran.
+if(NOT QUILLANE_SANITIZE)
+    target_compile_options(quillane_options INTERFACE -fstack-protector-strong)
+    target_compile_definitions(quillane_options INTERFACE
+        $<$<NOT:$<CONFIG:Debug>>:_FORTIFY_SOURCE=2>)
+    target_link_options(quillane_options INTERFACE LINKER:-z,relro LINKER:-z,now)
+endif()
+
 set(CPACK_GENERATOR DEB)
 set(CPACK_PACKAGE_NAME quillane)
 set(CPACK_PACKAGE_VERSION ${PROJECT_VERSION})

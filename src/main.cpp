@@ -13,7 +13,6 @@
 #include <QFileInfo>
 
 #include <cstdio>
-#include <cstring>
 
 using namespace Qt::StringLiterals;
 
@@ -43,38 +42,53 @@ QString programFolder()
     return QFileInfo(QFileInfo(u"/proc/self/exe"_s).canonicalFilePath()).absolutePath();
 }
 
+// The file of --database FILE (or --database=FILE), empty without one. The
+// first argument that is not ours goes to wrong.
+QString databaseOption(const QStringList& arguments, QString& wrong)
+{
+    QString database;
+    for (qsizetype at = 1; at < arguments.size(); ++at) {
+        const QString& option = arguments.at(at);
+        if (option == u"--database" && at + 1 < arguments.size())
+            database = arguments.at(++at);
+        else if (option.startsWith(u"--database="))
+            database = option.section(u'=', 1);
+        else if (wrong.isEmpty())
+            wrong = option;
+    }
+    return database;
+}
+
 } // namespace
 
 int main(int argc, char** argv)
 {
     // Help and version need no display, so they come before the application.
-    for (int i = 1; i < argc; ++i) {
-        if (std::strcmp(argv[i], "-h") == 0 || std::strcmp(argv[i], "--help") == 0) {
-            std::fputs(Help, stdout);
-            return 0;
-        }
-        if (std::strcmp(argv[i], "--version") == 0) {
-            std::printf(
-                "quillane %s\n%s\n", QUILLANE_VERSION,
-                qUtf8Printable(describeNamesDatabase(chooseNamesDatabase(programFolder()))));
-            return 0;
-        }
+    QStringList given;
+    for (int i = 0; i < argc; ++i)
+        given.append(QString::fromLocal8Bit(argv[i]));
+    if (given.contains(u"-h"_s) || given.contains(u"--help"_s)) {
+        std::fputs(Help, stdout);
+        return 0;
+    }
+    if (given.contains(u"--version"_s)) {
+        QString ignored;
+        const QString database = databaseOption(given, ignored);
+        const QString where = database.isEmpty()
+                                  ? describeNamesDatabase(chooseNamesDatabase(programFolder()))
+                                  : u"names database: "_s + database;
+        std::printf("quillane %s\n%s\n", QUILLANE_VERSION, qUtf8Printable(where));
+        return 0;
     }
 
+    // Qt takes its own options out of the arguments.
     QuillaneApplication app(argc, argv);
-    QString database;
-    const QStringList arguments = QCoreApplication::arguments();
-    for (qsizetype at = 1; at < arguments.size(); ++at) {
-        const QString& option = arguments.at(at);
-        if (option == u"--database" && at + 1 < arguments.size()) {
-            database = arguments.at(++at);
-        } else if (option.startsWith(u"--database=")) {
-            database = option.section(u'=', 1);
-        } else {
-            std::fprintf(stderr, "quillane: Unknown argument '%s'. Try 'quillane --help'.\n",
-                         qUtf8Printable(option));
-            return 2;
-        }
+    QString wrong;
+    QString database = databaseOption(QCoreApplication::arguments(), wrong);
+    if (!wrong.isEmpty()) {
+        std::fprintf(stderr, "quillane: Unknown argument '%s'. Try 'quillane --help'.\n",
+                     qUtf8Printable(wrong));
+        return 2;
     }
 
     QtDialogs dialogs;
