@@ -1,10 +1,12 @@
 #!/usr/bin/env bash
-# Sets up a Debian 12 machine for Quillane, builds it, and then either starts
-# the program or runs every test headless.
+# Sets up a Debian 12 machine for Quillane, builds it, and then starts the
+# program, runs every test headless, or makes the Debian package.
 #
-#   scripts/setup.sh run     install what is missing, build, start the program
-#   scripts/setup.sh test    install what is missing, build, run all tests
-#   scripts/setup.sh build   install what is missing, build (for other scripts)
+#   scripts/setup.sh run      install what is missing, build, start the program
+#   scripts/setup.sh test     install what is missing, build, run all tests
+#   scripts/setup.sh package  install what is missing, build, make
+#                             build/quillane_<version>_<arch>.deb
+#   scripts/setup.sh build    install what is missing, build (for other scripts)
 #
 # Environment: BUILD_DIR (default: build), QUILLANE_WERROR=ON to fail on
 # warnings, QUILLANE_SANITIZE=ON for an AddressSanitizer/UBSan build,
@@ -13,8 +15,8 @@ set -euo pipefail
 
 mode=${1:-}
 case "$mode" in
-    run|test|build) ;;
-    *) echo "usage: $0 run|test|build" >&2; exit 2 ;;
+    run|test|package|build) ;;
+    *) echo "usage: $0 run|test|package|build" >&2; exit 2 ;;
 esac
 
 top=$(cd "$(dirname "$0")/.." && pwd)
@@ -28,8 +30,8 @@ packages=(
     fonts-liberation2 xdg-utils
     # for the headless tests and the reading back of saved workbooks
     xvfb xauth dbus python3-openpyxl
-    # for checking the installed menu entry
-    desktop-file-utils
+    # for the package (dpkg-shlibdeps, file) and for checking what it holds
+    dpkg-dev file lintian appstream desktop-file-utils bash-completion
     # for scripts/coverage.sh
     gcovr
     # for scripts/fuzz.sh (libFuzzer)
@@ -48,6 +50,21 @@ cmake --build "$build"
 case "$mode" in
     run) exec "$build/bin/quillane" ;;
     build) exit 0 ;;
+    package)
+        # cpack's install writes the build's install_manifest.txt, which is
+        # the record of an install of your own (and what removing it reads):
+        # it is put back as it was.
+        manifest="$build/install_manifest.txt"
+        saved="$build/install_manifest.txt.saved"
+        rm -f "$saved" "$build"/quillane_*.deb
+        [ ! -e "$manifest" ] || mv "$manifest" "$saved"
+        status=0
+        (cd "$build" && cpack -G DEB) || status=$?
+        rm -f "$manifest"
+        [ ! -e "$saved" ] || mv "$saved" "$manifest"
+        [ "$status" -eq 0 ] || exit "$status"
+        ls "$build"/quillane_*.deb
+        exit 0 ;;
 esac
 
 export QT_QPA_PLATFORM=offscreen

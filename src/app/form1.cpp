@@ -63,8 +63,8 @@ Form1::Form1(Environment& environment, QWidget* parent)
     , m_pointer(new WindowPointer(this))
     , m_sourceGroup(new QButtonGroup(this))
     , m_genderGroup(new QButtonGroup(this))
-    , m_lists(namesDatabasePath(environment.programFolder))
-    , m_editor(environment.dialogs, namesDatabasePath(environment.programFolder), m_lists,
+    , m_lists(environment.namesDatabaseFile())
+    , m_editor(environment.dialogs, environment.namesDatabaseFile(), m_lists,
                *m_pointer, [this] { return listChoice(); })
 {
     buildLayout();

@@ -56,9 +56,12 @@ Commands:
   import     add the names of text files, one per line, to a list
 
 Options:
-  --database FILE  the names database (default: names.mdb beside the program)
+  --database FILE  the names database (default: names.mdb beside the
+                   program, or your own copy of it in
+                   $XDG_DATA_HOME/quillane, ~/.local/share/quillane, where
+                   the program's folder cannot be written)
   -h, --help       show this help
-  --version        show the version
+  --version        show the version and the names database in use
 
 Run 'quillane-cli COMMAND --help' for the options of a command.
 )";
@@ -159,10 +162,14 @@ const std::map<QString, Format> Formats = {
 
 class Command {
 public:
-    Command(QString name, const QStringList& arguments, QString database, std::FILE* out)
+    // An empty database means the program's default, chosen only once the
+    // command line asks for a command to run.
+    Command(QString name, const QStringList& arguments, QString database, QString programFolder,
+            std::FILE* out)
         : m_name(std::move(name))
         , m_arguments(arguments)
         , m_database(std::move(database))
+        , m_programFolder(std::move(programFolder))
         , m_out(out)
     {
     }
@@ -207,6 +214,8 @@ private:
         if (mostPositional >= 0 && count > mostPositional)
             usage(u"Unexpected argument '%1'."_s.arg(m_parser.positionalArguments().at(count - 1)),
                   m_name);
+        if (m_database.isEmpty())
+            m_database = namesDatabaseInUse(m_programFolder);
         return true;
     }
 
@@ -282,6 +291,7 @@ private:
     QString m_name;
     QStringList m_arguments;
     QString m_database;
+    QString m_programFolder;
     std::FILE* m_out;
     QCommandLineParser m_parser;
 };
@@ -483,7 +493,7 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
             std::fputs(qUtf8Printable(Program + u": "_s + escapeControlCharacters(line) + u'\n'),
                        err);
     };
-    QString database = namesDatabasePath(programFolder);
+    QString database;
     try {
         // The options before the command, then the command and its own.
         qsizetype at = 1;
@@ -494,8 +504,12 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
                 return Done;
             }
             if (option == u"--version") {
-                std::fputs(
-                    qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'), out);
+                const QString where =
+                    database.isEmpty() ? describeNamesDatabase(chooseNamesDatabase(programFolder))
+                                       : u"names database: "_s + database;
+                std::fputs(qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'
+                                          + where + u'\n'),
+                           out);
                 return Done;
             }
             if (option == u"--database" && at + 1 < arguments.size())
@@ -510,7 +524,7 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
         const QString name = arguments.at(at);
         if (!CommandHelp.contains(name))
             usage(u"'%1' is not a command."_s.arg(name));
-        Command command(name, arguments.mid(at + 1), database, out);
+        Command command(name, arguments.mid(at + 1), database, programFolder, out);
         return command.run();
     } catch (const UsageProblem& problem) {
         // One line, the way to the help included.

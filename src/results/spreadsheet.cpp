@@ -5,6 +5,7 @@
 #include "base/shell.h"
 #include "results/resultrows.h"
 #include "results/resultsfile.h"
+#include "results/workbookcache.h"
 
 #include <QCoreApplication>
 #include <QDateTime>
@@ -304,6 +305,7 @@ SpreadsheetApplication::SpreadsheetApplication(Shell& shell, QString folder)
 {
     if (!QDir().mkpath(m_folder))
         throw Failure(u"The folder %1 could not be made"_s.arg(QDir::toNativeSeparators(m_folder)));
+    removeOldWorkbooks(m_folder, QDateTime::currentDateTime());
 }
 
 SpreadsheetApplication::~SpreadsheetApplication() = default;
