@@ -118,6 +118,7 @@ private Q_SLOTS:
         QTest::newRow("negative height") << with(written, 30, quint32(-4), 4) << QString();
         QTest::newRow("odd height") << with(written, 30, 3, 4) << QString();
         QTest::newRow("257 high") << with(written, 30, 514, 4) << QString();
+        QTest::newRow("wider than its colours") << with(written, 26, 4, 4) << QString();
         QTest::newRow("two planes") << with(written, 34, 2) << QString();
         QTest::newRow("compressed") << with(written, 38, 3, 4) << QString();
         QTest::newRow("hotspot below") << with(written, 12, 2) << QString();
@@ -152,6 +153,9 @@ private Q_SLOTS:
         QTest::newRow("entry in a subfolder")
             << u"a.xlsx"_s << u"text/x-sheet"_s << u"quill-sheets.desktop"_s
             << home + u"more/quill-sheets.desktop"_s << QString();
+        QTest::newRow("entry starting with a dash")
+            << u"a.xlsx"_s << u"text/x-sheet"_s << u"-sheets.desktop"_s
+            << home + u"-sheets.desktop"_s << QString();
         QTest::newRow("type from the name")
             << u"a.txt"_s << u""_s << u""_s << u""_s << missing + u"txt files (text/plain)."_s;
         QTest::newRow("no program for the type")
