@@ -179,8 +179,9 @@ private Q_SLOTS:
         // for the results window's; Check1 is the splash's box, clicked during
         // its pause), input= and file= answer the next prompt or file dialog
         // (a file's lines separated by commas), save answers the save dialog,
-        // Text1= types the count, select=, key= and double= select, press
-        // Delete on and double-click a pane's name.
+        // Text1= types the count, select= and double= select and double-click
+        // a pane's name, key= presses Delete (or the key after a colon) on a
+        // pane.
         QTest::addColumn<QString>("steps");
         QTest::addColumn<QString>("tables"); // allTables() afterwards
         // The first and the last names shown, the messages, the results
@@ -230,7 +231,10 @@ private Q_SLOTS:
             u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al|Quill Rook Nia"_s, u"Al Zoe|Nia Quill Rook|0"_s);
         row("Help", u"PushButton8"_s, start, u"Adam Bo Cleo|Lee Moss|1"_s);
         row("Delete key", u"select=ListView2:Bo key=ListView2"_s, start, u"Adam Cleo|Lee Moss|0"_s);
+        row("another key", u"select=ListView1:Moss key=ListView1:L"_s, start, both);
         row("double-click", u"double=ListView1:Moss"_s, start, u"Adam Bo Cleo|Lee|0"_s);
+        row("double-click, first names", u"double=ListView2:Adam"_s, start,
+            u"Bo Cleo|Lee Moss|0"_s);
         row("Start Generating", u"Text1=3 PushButton1"_s, start, both + u"|3 rows"_s);
         row("< Back", u"PushButton1 Form2.PushButton8"_s, start, both + u"|back"_s);
         row("Text File", u"PushButton1 Form2.Option5 Form2.Option4 save Form2.PushButton2"_s, start,
@@ -282,7 +286,10 @@ private Q_SLOTS:
             } else if (step.startsWith(u"select="_s)) {
                 selectName(*form, value);
             } else if (step.startsWith(u"key="_s)) {
-                QTest::keyClick(control<QWidget>(*form, value), Qt::Key_Delete);
+                auto* pane = control<QWidget>(*form, value.section(u':', 0, 0));
+                const QString key = value.section(u':', 1);
+                key.isEmpty() ? QTest::keyClick(pane, Qt::Key_Delete)
+                              : QTest::keyClick(pane, key.at(0).toLatin1());
             } else if (step.startsWith(u"double="_s)) {
                 QAbstractItemView* pane = selectName(*form, value);
                 const QPoint at = pane->visualRect(pane->currentIndex()).center();
