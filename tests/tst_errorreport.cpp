@@ -36,11 +36,13 @@ private Q_SLOTS:
     void controlCharactersShownEscaped()
     {
         FakeDialogs dialogs;
-        ShowErrorReport(dialogs,
-                        u"Bad\x1b[2J\x1b]0;title\x07name\tx\ry\x7f\u009b\u2028 A\u0308\nNext line"_s,
-                        u"in Tessmark.Main.FileToListview "_s, 5, ClosingLine::Long);
-        QCOMPARE(dialogs.messages().value(0).section(u"\r\n"_s, 0, 0),
-                 u"Bad\\x1b[2J\\x1b]0;title\\x07name\\tx\\ry\\x7f\\x9b\\u2028 A\u0308\nNext line"_s);
+        ShowErrorReport(
+            dialogs,
+            u"Bad\x1b[2J\x1b]0;title\x07name\tx\ry\x7f\u009b\u2028\u2029 A\u0308\nNext line"_s,
+            u"in Tessmark.Main.FileToListview "_s, 5, ClosingLine::Long);
+        QCOMPARE(
+            dialogs.messages().value(0).section(u"\r\n"_s, 0, 0),
+            u"Bad\\x1b[2J\\x1b]0;title\\x07name\\tx\\ry\\x7f\\x9b\\u2028\\u2029 A\u0308\nNext line"_s);
     }
 
     // Each failing step of a handler is reported under the handler's location
@@ -61,16 +63,21 @@ private Q_SLOTS:
                 throw std::runtime_error("second");
         });
         trap(40, [&] { lists.RefreshLists(ListChoice{}); });
+        trap(41, [&] { throw std::bad_alloc(); });
+        trap(42, [&] { throw 42; });
         trap(50, [&] { ran << u"50"_s; });
-        QCOMPARE(trap.failures(), 3);
+        QCOMPARE(trap.failures(), 5);
         QCOMPARE(ran, (QStringList{u"10"_s, u"50"_s}));
         QCOMPARE(turns, 1);
         const auto report = [](const QString& description, int line) {
             return errorReportText(description, u"in Tessmark.Form1.PushButton8_Click "_s, line,
                                    ClosingLine::Long);
         };
-        QCOMPARE(dialogs.messages(), (QStringList{report(u"first"_s, 20), report(u"second"_s, 30),
-                                                  report(u"/nonexistent/folder/names.mdb: unable to open database file"_s, 40)}));
+        QCOMPARE(dialogs.messages(),
+                 (QStringList{
+                     report(u"first"_s, 20), report(u"second"_s, 30),
+                     report(u"/nonexistent/folder/names.mdb: unable to open database file"_s, 40),
+                     report(u"Out of memory"_s, 41), report(u"Unknown error"_s, 42)}));
     }
 
     void cliComplaintsShowControlCharactersEscaped_data()

@@ -1,7 +1,9 @@
-// The main window: start-up from the stored choices, the option clicks, the
-// panes, the count box, the "Help" message, what a screen reader says, the
-// titles the window system shows, and start-up with an unusable database or
-// settings store.
+// The main window: start-up from the stored choices, the option clicks, every
+// control of the windows clicked with every table checked afterwards, the
+// count box and its bound, the report cap of a loaded file, the progress bar,
+// the panes, the "Help" message, what a screen reader says, the titles the
+// window system shows, and start-up with an unusable database or settings
+// store.
 #include "app/form2.h"
 #include "app/qtdialogs.h"
 #include "base/failure.h"
@@ -10,11 +12,15 @@
 #include <QAccessible>
 #include <QGroupBox>
 #include <QLineEdit>
+#include <QProgressBar>
 #include <QRadioButton>
+#include <QSignalSpy>
 #include <QTimer>
 #include <QWindow>
 
 #include <functional>
+#include <numeric>
+#include <utility>
 
 using namespace Qt::StringLiterals;
 
@@ -76,6 +82,36 @@ QString dialogTitle(const std::function<void()>& action)
     return title;
 }
 
+// Every table of the names database, its names in storage order, the
+// tables in the shared order, separated by "|".
+QString allTables(const QString& db)
+{
+    QStringList tables;
+    for (qsizetype t = 0; t < DatabaseTables.size(); ++t)
+        tables << tableColumn(db, DatabaseTables[t], DatabaseColumns[t]).join(u' ');
+    return tables.join(u'|');
+}
+
+// A fresh program folder whose every table holds names: Bo is both a male
+// and a female first name.
+void fillAllTables(TestEnvironment& env)
+{
+    createEmptyDatabase(env.databasePath());
+    const QStringList names = u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al|Quill Rook"_s.split(u'|');
+    for (qsizetype t = 0; t < DatabaseTables.size(); ++t)
+        insertRows(env.databasePath(), DatabaseTables[t], DatabaseColumns[t], names[t].split(u' '));
+}
+
+// Selects the row of the pane that shows the name.
+QAbstractItemView* selectName(QWidget& form, const QString& paneAndName)
+{
+    auto* pane = control<QAbstractItemView>(form, paneAndName.section(u':', 0, 0));
+    const QStringList shown = shownColumn(form, pane->objectName());
+    pane->setCurrentIndex(
+        pane->model()->index(int(shown.indexOf(paneAndName.section(u':', 1))), 0));
+    return pane;
+}
+
 } // namespace
 
 class TestForm1 : public QObject {
@@ -135,6 +171,218 @@ private Q_SLOTS:
                 QCOMPARE(QAccessible::queryAccessibleInterface(widget)->text(QAccessible::Name),
                          button ? button->text() : frame->title());
         }
+    }
+
+    void clickingEverything_data()
+    {
+        // What the user does, in order: a control's name clicks it (Form2.
+        // for the results window's; Check1 is the splash's box, clicked during
+        // its pause), input= and file= answer the next prompt or file dialog
+        // (a file's lines separated by commas), save answers the save dialog,
+        // Text1= types the count, select= and double= select and double-click
+        // a pane's name, key= presses Delete (or the key after a colon) on a
+        // pane.
+        QTest::addColumn<QString>("steps");
+        QTest::addColumn<QString>("tables"); // allTables() afterwards
+        // The first and the last names shown, the messages, the results
+        // shown, what reached outside the program.
+        QTest::addColumn<QString>("shown");
+        const QString start = u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al|Quill Rook"_s;
+        const QString both = u"Adam Bo Cleo|Lee Moss|0"_s, user = u"Al Zoe|Quill Rook|0"_s;
+        const auto row = [](const char* tag, const QString& steps, const QString& tables,
+                            QString shown) {
+            while (shown.count(u'|') < 4)
+                shown += u'|';
+            QTest::newRow(tag) << steps << tables << shown;
+        };
+        row("Male Only", u"Option2"_s, start, u"Adam Bo|Lee Moss|0"_s);
+        row("Female Only", u"Option3"_s, start, u"Bo Cleo|Lee Moss|0"_s);
+        row("Both", u"Option2 Option1"_s, start, both);
+        row("User List", u"Option8"_s, start, user);
+        row("Orvell's List", u"Option8 Option9"_s, start, both);
+        row("Add First Name", u"input=Nia PushButton2"_s,
+            u"Adam Bo|Cleo Bo Nia|Lee Moss|Zoe Al|Quill Rook"_s, u"Adam Bo Cleo Nia|Lee Moss|0"_s);
+        row("Add Last Name", u"input=Nia PushButton5"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss Nia|Zoe Al|Quill Rook"_s, u"Adam Bo Cleo|Lee Moss Nia|0"_s);
+        row("Add First Name, user", u"Option8 input=Nia PushButton2"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al Nia|Quill Rook"_s, u"Al Nia Zoe|Quill Rook|0"_s);
+        row("Add Last Name, user", u"Option8 input=Nia PushButton5"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al|Quill Rook Nia"_s, u"Al Zoe|Nia Quill Rook|0"_s);
+        row("Delete first name, Both", u"select=ListView2:Bo PushButton4"_s,
+            u"Adam|Cleo|Lee Moss|Zoe Al|Quill Rook"_s, u"Adam Cleo|Lee Moss|0"_s);
+        row("Delete first name, Male Only", u"Option2 select=ListView2:Bo PushButton4"_s,
+            u"Adam|Cleo Bo|Lee Moss|Zoe Al|Quill Rook"_s, u"Adam|Lee Moss|0"_s);
+        row("Delete first name, Female Only", u"Option3 select=ListView2:Bo PushButton4"_s,
+            u"Adam Bo|Cleo|Lee Moss|Zoe Al|Quill Rook"_s, u"Cleo|Lee Moss|0"_s);
+        row("Delete last name", u"select=ListView1:Moss PushButton3"_s,
+            u"Adam Bo|Cleo Bo|Lee|Zoe Al|Quill Rook"_s, u"Adam Bo Cleo|Lee|0"_s);
+        row("Clear first names", u"Option8 PushButton4"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss||Quill Rook"_s, u"|Quill Rook|0"_s);
+        row("Clear last names", u"Option8 select=ListView1:Rook PushButton3"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al|"_s, u"Al Zoe||0"_s);
+        row("Load First Names", u"file=Nia,Ola PushButton6"_s,
+            u"Adam Bo|Cleo Bo Nia Ola|Lee Moss|Zoe Al|Quill Rook"_s,
+            u"Adam Bo Cleo Nia Ola|Lee Moss|0"_s);
+        row("Load Last Names", u"file=Nia PushButton7"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss Nia|Zoe Al|Quill Rook"_s, u"Adam Bo Cleo|Lee Moss Nia|0"_s);
+        row("Load First Names, user", u"Option8 file=Nia PushButton6"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al Nia|Quill Rook"_s, u"Al Nia Zoe|Quill Rook|0"_s);
+        row("Load Last Names, user", u"Option8 file=Nia PushButton7"_s,
+            u"Adam Bo|Cleo Bo|Lee Moss|Zoe Al|Quill Rook Nia"_s, u"Al Zoe|Nia Quill Rook|0"_s);
+        row("Help", u"PushButton8"_s, start, u"Adam Bo Cleo|Lee Moss|1"_s);
+        row("Delete key", u"select=ListView2:Bo key=ListView2"_s, start, u"Adam Cleo|Lee Moss|0"_s);
+        row("another key", u"select=ListView1:Moss key=ListView1:L"_s, start, both);
+        row("double-click", u"double=ListView1:Moss"_s, start, u"Adam Bo Cleo|Lee|0"_s);
+        row("double-click, first names", u"double=ListView2:Adam"_s, start,
+            u"Bo Cleo|Lee Moss|0"_s);
+        row("Start Generating", u"Text1=3 PushButton1"_s, start, both + u"|3 rows"_s);
+        row("< Back", u"PushButton1 Form2.PushButton8"_s, start, both + u"|back"_s);
+        row("Text File", u"PushButton1 Form2.Option5 Form2.Option4 save Form2.PushButton2"_s, start,
+            both + u"|100 rows|saved"_s);
+        row("Excel (2 cells)", u"PushButton1 Form2.Option5 Form2.PushButton2"_s, start,
+            both + u"|100 rows|opened"_s);
+        row("Excel (1 cell)", u"PushButton1 Form2.Option6 Form2.PushButton2"_s, start,
+            both + u"|100 rows|opened"_s);
+        row("Hide this at next startup", u"Check1"_s, start, both + u"||ShowAgain=1"_s);
+        // The bound of the count box; half a name rounds to the even count.
+        row("999999", u"Text1=999999 PushButton1"_s, start, both + u"|999999 rows"_s);
+        row("1000000", u"Text1=1000000 PushButton1"_s, start, both + u"|1000000 rows"_s);
+        row("1000000.5", u"Text1=1000000.5 PushButton1"_s, start, both + u"|1000000 rows"_s);
+        row("1000001", u"Text1=1000001 PushButton1"_s, start, u"Adam Bo Cleo|Lee Moss|1"_s);
+    }
+
+    // Each button, option and command with names in every table: the one
+    // table it should change changes, and every other table stays as it was.
+    void clickingEverything()
+    {
+        QFETCH(QString, steps);
+        TestEnvironment env(false);
+        fillAllTables(env);
+        bool ticked = false; // once: the pause may end in more than one wait
+        if (steps.contains(u"Check1"_s)) {
+            QImage picture(40, 20, QImage::Format_RGB32);
+            picture.fill(Qt::red);
+            QDir().mkpath(env.filePath(u"Splash"_s));
+            QVERIFY(picture.save(env.filePath(u"Splash/a.png"_s)));
+            env.clock.duringWait = [&ticked] {
+                for (QWidget* window : QApplication::topLevelWidgets())
+                    if (window->objectName() == u"Splash"_s && !std::exchange(ticked, true))
+                        QTest::mouseClick(control<QWidget>(*window, u"Check1"_s), Qt::LeftButton);
+            };
+        }
+        const auto form = loadedForm1(env.environment, true);
+        for (const QString& step : steps.split(u' ')) {
+            const QString value = step.section(u'=', 1);
+            if (step.startsWith(u"Text1="_s)) {
+                control<QLineEdit>(*form, u"Text1"_s)->setText(value);
+            } else if (step.startsWith(u"input="_s)) {
+                env.dialogs.answerInput(value);
+            } else if (step.startsWith(u"file="_s)) {
+                writeBytes(env.filePath(u"list.txt"_s),
+                           QString(value).replace(u',', u'\n').toUtf8());
+                env.dialogs.answerOpen({env.filePath(u"list.txt"_s)});
+            } else if (step == u"save"_s) {
+                env.dialogs.answerSave(env.filePath(u"saved.txt"_s));
+            } else if (step.startsWith(u"select="_s)) {
+                selectName(*form, value);
+            } else if (step.startsWith(u"key="_s)) {
+                auto* pane = control<QWidget>(*form, value.section(u':', 0, 0));
+                const QString key = value.section(u':', 1);
+                key.isEmpty() ? QTest::keyClick(pane, Qt::Key_Delete)
+                              : QTest::keyClick(pane, key.at(0).toLatin1());
+            } else if (step.startsWith(u"double="_s)) {
+                QAbstractItemView* pane = selectName(*form, value);
+                const QPoint at = pane->visualRect(pane->currentIndex()).center();
+                QTest::mouseClick(pane->viewport(), Qt::LeftButton, {}, at);
+                QTest::mouseDClick(pane->viewport(), Qt::LeftButton, {}, at);
+            } else if (step.startsWith(u"Form2."_s)) {
+                control<QAbstractButton>(*form->resultsWindow(), step.mid(6))->click();
+            } else if (step != u"Check1"_s) {
+                control<QAbstractButton>(*form, step)->click();
+            }
+        }
+        QTEST(allTables(env.databasePath()), "tables");
+        QStringList outside;
+        if (QFile::exists(env.filePath(u"saved.txt"_s)))
+            outside << u"saved"_s;
+        if (!env.shell.documents.isEmpty())
+            outside << u"opened"_s;
+        if (const QString showAgain = env.settings->read(u"ShowAgain"_s, {}); !showAgain.isEmpty())
+            outside << u"ShowAgain="_s + showAgain;
+        Form2* results = form->resultsWindow();
+        QTEST(QStringList({shownColumn(*form, u"ListView2"_s).join(u' '),
+                           shownColumn(*form, u"ListView1"_s).join(u' '),
+                           QString::number(env.dialogs.messages().size()),
+                           !results               ? QString()
+                           : results->isVisible() ? u"%1 rows"_s.arg(results->results().rowCount())
+                                                  : u"back"_s,
+                           outside.join(u' ')})
+                  .join(u'|'),
+              "shown");
+    }
+
+    void loadingReportsTenRejectedNamesAtMost_data()
+    {
+        QTest::addColumn<int>("overlong"); // names, before the one that fits
+        QTest::addColumn<QString>("more"); // the last report; empty: none
+        QTest::newRow("9") << 9 << QString();
+        QTest::newRow("10") << 10 << QString();
+        QTest::newRow("11") << 11 << u"1 more names of this file were not stored."_s;
+        QTest::newRow("12") << 12 << u"2 more names of this file were not stored."_s;
+    }
+
+    // Each name too long to store is reported, up to ten; the rest are
+    // counted in one report. The names that fit are stored all the same.
+    void loadingReportsTenRejectedNamesAtMost()
+    {
+        QFETCH(int, overlong);
+        QFETCH(QString, more);
+        TestEnvironment env(false);
+        fillAllTables(env);
+        const auto form = loadedForm1(env.environment);
+        const QString file = env.filePath(u"list.txt"_s);
+        writeBytes(file,
+                   (QStringList(overlong, QString(256, u'x')) << u"Nia"_s).join(u'\n').toUtf8());
+        env.dialogs.answerOpen({file});
+        control<QAbstractButton>(*form, u"PushButton6"_s)->click();
+        const QStringList messages = env.dialogs.messages();
+        const QString location = u"in Tessmark.Main.FileToListview "_s;
+        QCOMPARE(messages.size(), std::min(overlong, 10) + (more.isEmpty() ? 0 : 1));
+        for (int i = 0; i < std::min(overlong, 10); ++i)
+            QVERIFY(messages[i].endsWith(errorReportText({}, location, 50, ClosingLine::Long)));
+        if (!more.isEmpty())
+            QCOMPARE(messages.last(), errorReportText(more, location, 60, ClosingLine::Long));
+        QCOMPARE(allTables(env.databasePath()),
+                 u"Adam Bo|Cleo Bo Nia|Lee Moss|Zoe Al|Quill Rook"_s);
+    }
+
+    void theBarDuringARun_data()
+    {
+        QTest::addColumn<int>("count");
+        QTest::addColumn<QList<int>>("values"); // the bar's, in turn
+        QList<int> each(100);
+        std::iota(each.begin(), each.end(), 1);
+        QTest::newRow("none") << 0 << QList<int>{};
+        QTest::newRow("one") << 1 << QList<int>{100, 0};
+        QTest::newRow("two") << 2 << QList<int>{50, 100, 0};
+        QTest::newRow("200: halves to even, each value once") << 200 << (each << 0);
+    }
+
+    // The bar moves up to full, then goes back to empty for the next run.
+    void theBarDuringARun()
+    {
+        QFETCH(int, count);
+        TestEnvironment env(false);
+        fillAllTables(env);
+        const auto form = loadedForm1(env.environment, true);
+        auto* bar = control<QProgressBar>(*form, u"ProgressBar1"_s);
+        QSignalSpy values(bar, &QProgressBar::valueChanged);
+        control<QLineEdit>(*form, u"Text1"_s)->setText(QString::number(count));
+        control<QAbstractButton>(*form, u"PushButton1"_s)->click();
+        QList<int> seen;
+        for (const QList<QVariant>& value : values)
+            seen << value[0].toInt();
+        QTEST(seen, "values");
     }
 
     void shownTitles_data()
@@ -312,6 +560,16 @@ private Q_SLOTS:
             QCOMPARE(env.dialogs.shown[0].title, u"Application Error"_s);
             QCOMPARE(env.dialogs.shown[0].icon, MessageIcon::Exclamation);
         }
+    }
+
+    void closingTheMainWindowEndsTheProgram()
+    {
+        TestEnvironment env;
+        const auto form = loadedForm1(env.environment, true);
+        QTimer::singleShot(0, form.get(), [&] { form->close(); });
+        // Only a safety net: a program that does not end fails instead of hanging.
+        QTimer::singleShot(10000, qApp, [] { QCoreApplication::exit(1); });
+        QCOMPARE(QApplication::exec(), 0);
     }
 
     void startUpFailsWithoutAUsableDatabase_data()

@@ -1,10 +1,12 @@
 // The shared window routines: the file test, the skin, the hover cursor and
 // its file, the random visit at start-up, the hover rule on a real window,
 // and the end of the program when a handler without a trap fails.
+#include "app/form2.h"
 #include "app/randomvisit.h"
 #include "app/windowroutines.h"
 #include "support/program.h"
 
+#include <QAbstractButton>
 #include <QMouseEvent>
 #include <QTimer>
 
@@ -23,6 +25,7 @@ private Q_SLOTS:
         QVERIFY(FileExists(folder));
         QVERIFY(!FileExists(folder + u"/gone.txt"_s));
         QVERIFY(!FileExists(QString()));
+        QVERIFY(!FileExists(folder + QChar(0) + u"/gone.txt"_s)); // not cut at the NUL
     }
 
     void skin_data()
@@ -68,18 +71,34 @@ private Q_SLOTS:
         QTest::newRow("an icon") << QByteArray(shipped).replace(2, 1, "\x01") << false;
         QTest::newRow("offset past the end") << QByteArray(shipped).replace(21, 1, "\x7f") << false;
         QTest::newRow("hotspot outside") << QByteArray(shipped).replace(10, 1, "\x28") << false;
+        // Anything past the picture is ignored, up to a file of one mebibyte.
+        QTest::newRow("1 MiB") << shipped + QByteArray((1 << 20) - shipped.size(), '\0') << true;
+        QTest::newRow("1 MiB and a byte")
+            << shipped + QByteArray((1 << 20) + 1 - shipped.size(), '\0') << false;
     }
 
     void cursorFile()
     {
         QFETCH(QByteArray, bytes);
         QFETCH(bool, loads);
-        QTemporaryDir folder;
-        writeBytes(cursorFilePath(folder.path()), bytes);
-        const std::optional<QCursor> cursor = loadCursorFile(cursorFilePath(folder.path()));
+        TestEnvironment env(false);
+        createEmptyDatabase(env.databasePath());
+        writeBytes(cursorFilePath(env.folder()), bytes);
+        const std::optional<QCursor> cursor = loadCursorFile(cursorFilePath(env.folder()));
         QCOMPARE(bool(cursor), loads);
         if (loads) // the hotspot on the fingertip
             QCOMPARE(cursor->hotSpot(), QPoint(7, 1));
+        // Over the buttons both windows show the file's hand, or the arrow.
+        const auto form = loadedForm1(env.environment);
+        form->lists().firstPane().setNames({u"Ann"_s});
+        form->lists().lastPane().setNames({u"Lee"_s});
+        control<QAbstractButton>(*form, u"PushButton1"_s)->click();
+        Form2* results = form->resultsWindow();
+        form->pointer().setMousePointer(MousePointer::Custom);
+        results->pointer().setMousePointer(MousePointer::Custom);
+        const Qt::CursorShape hand = loads ? Qt::BitmapCursor : Qt::ArrowCursor;
+        QCOMPARE(form->cursor().shape(), hand);
+        QCOMPARE(results->cursor().shape(), hand);
     }
 
     // Moves over controls in order, starting from the pointer given: the

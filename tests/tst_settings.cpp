@@ -45,7 +45,9 @@ private Q_SLOTS:
         QTest::newRow("lower case") << u"true"_s << u"0"_s << true;
         QTest::newRow("zero") << u"0"_s << u"1"_s << false;
         QTest::newRow("other number") << u"-2.5"_s << u"0"_s << true;
+        QTest::newRow("number in the user's format") << u"1,000"_s << u"0"_s << true;
         QTest::newRow("neither: the default") << u"maybe; \"x\" = 1,000"_s << u"1"_s << true;
+        QTest::newRow("neither, nor the default") << u"maybe"_s << u"perhaps"_s << false;
         QTest::newRow("empty: the default") << u""_s << u"0"_s << false;
         QTest::newRow("absent: the default") << QString() << u"1"_s << true;
     }
@@ -63,6 +65,18 @@ private Q_SLOTS:
         QCOMPARE(settings.read(u"Option9"_s, defaultValue),
                  stored.isNull() ? defaultValue : stored);
         QCOMPARE(settings.readBool(u"Option9"_s, defaultValue), asBoolean);
+    }
+
+    // With nowhere to report to, a write that fails is only remembered.
+    void unreportedWriteFailure()
+    {
+        QTemporaryDir folder;
+        QVERIFY(QDir(folder.path()).mkdir(u"Varnholt.ini"_s));
+        QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, folder.path());
+        Settings settings;
+        settings.write(u"Text1"_s, u"7"_s);
+        QVERIFY(settings.writeFailed());
+        QCOMPARE(settings.read(u"Text1"_s, {}), u"7"_s);
     }
 
     void damagedOrUnwritableStore_data()
