@@ -2,8 +2,8 @@
 // as a child process over a copy of the shipped database, its exit status,
 // its standard output and error, the files it writes, and what a failed run
 // leaves behind.
-#include "names/database.h"
 #include "app/form2.h"
+#include "names/database.h"
 #include "support/controls.h"
 #include "support/program.h"
 #include "support/workbook.h"
@@ -96,9 +96,32 @@ private Q_SLOTS:
         QTest::newRow("count not a number")
             << QStringList{u"generate"_s, u"-n"_s, u"ten"_s} << 2
             << u"quillane-cli: How many does not appear to be a number."_s;
-        QTest::newRow("count too large")
-            << QStringList{u"generate"_s, u"--count"_s, u"1000001"_s} << 2
-            << u"quillane-cli: You must select an amount less than one million."_s;
+        QTest::newRow("count below zero")
+            << QStringList{u"generate"_s, u"-n"_s, u"-5"_s} << 2
+            << u"quillane-cli: -n takes a count of 0 or more, not '-5'."_s;
+        QTest::newRow("count far below zero")
+            << QStringList{u"generate"_s, u"-n"_s, u"-1e308"_s} << 2
+            << u"quillane-cli: -n takes a count of 0 or more, not '-1e308'."_s;
+        QTest::newRow("count beyond 64 bits")
+            << QStringList{u"generate"_s, u"-n"_s, u"1e19"_s} << 2
+            << u"quillane-cli: -n takes at most 9223372036854775807 names, not '1e19'."_s;
+        QTest::newRow("more rows than a sheet holds")
+            << QStringList{u"generate"_s, u"--count"_s, u"1048577"_s, u"-o"_s, u"%1/out.xlsx"_s}
+            << 2 << u"quillane-cli: A worksheet holds at most 1048576 rows"_s;
+        QTest::newRow("a workbook in shards")
+            << QStringList{u"generate"_s, u"-n"_s, u"3"_s,          u"--shard"_s,
+                           u"1/2"_s,      u"-o"_s, u"%1/out.xlsx"_s}
+            << 2 << u"quillane-cli: A workbook is one file: it cannot be made in shards."_s;
+        QTest::newRow("shard beyond the shards")
+            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--shard"_s, u"3/2"_s} << 2
+            << u"quillane-cli: --shard takes I/N, part I of N, with 1 <= I <= N, not '3/2'."_s;
+        QTest::newRow("no threads")
+            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--threads"_s, u"0"_s} << 2
+            << u"quillane-cli: --threads takes a whole number from 1 to 1024, not '0'."_s;
+        QTest::newRow("a table for csv")
+            << QStringList{u"generate"_s, u"-n"_s,       u"3"_s,  u"--table"_s,
+                           u"t"_s,        u"--format"_s, u"csv"_s}
+            << 2 << u"quillane-cli: --table names the table of the sql format."_s;
         QTest::newRow("workbook to standard output")
             << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--format"_s, u"xlsx1"_s} << 2
             << u"quillane-cli: A workbook is written to a file: give -o FILE."_s;
@@ -266,7 +289,8 @@ private Q_SLOTS:
         QTest::addColumn<int>("rows");
         QTest::newRow("plain") << u"25"_s << u"C.UTF-8"_s << 25;
         QTest::newRow("decimal comma") << u"3,5"_s << u"de_DE.UTF-8"_s << 4;
-        QTest::newRow("negative makes none") << u"-5"_s << u"C.UTF-8"_s << 0;
+        QTest::newRow("none") << u"0"_s << u"C.UTF-8"_s << 0;
+        QTest::newRow("beyond the window's bound") << u"1000000.6"_s << u"C.UTF-8"_s << 1000001;
     }
 
     void readsTheCountAsTheWindowDoes()
@@ -275,7 +299,7 @@ private Q_SLOTS:
         QFETCH(QString, locale);
         const Run result = run({u"generate"_s, u"-n"_s, count}, locale);
         QCOMPARE(result.status, 0);
-        QTEST(int(lines(result.out).size()), "rows");
+        QTEST(int(result.out.count('\n')), "rows");
     }
 
     void theSeedReplaysARun()

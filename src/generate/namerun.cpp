@@ -1,0 +1,127 @@
+#include "generate/namerun.h"
+
+#include "base/failure.h"
+
+#include <QSet>
+
+#include <bit>
+
+using namespace Qt::StringLiterals;
+
+RowRange shardRows(std::int64_t count, int shard, int shards, std::int64_t unit)
+{
+    // Whole units, the last one perhaps short, shared out as evenly as the
+    // units allow; 128-bit products, since count may be near 2^63.
+    const std::int64_t units = count / unit + (count % unit != 0 ? 1 : 0);
+    const auto boundary = [&](int i) {
+        const auto unitsBefore = std::int64_t(__int128(units) * i / shards);
+        return std::min<std::int64_t>(count, unitsBefore * unit);
+    };
+    return {boundary(shard - 1), boundary(shard)};
+}
+
+namespace {
+
+std::uint64_t mix(std::uint64_t z)
+{
+    z = (z ^ (z >> 30)) * 0xbf58476d1ce4e5b9ULL;
+    z = (z ^ (z >> 27)) * 0x94d049bb133111ebULL;
+    return z ^ (z >> 31);
+}
+
+} // namespace
+
+PairPermutation::PairPermutation(std::uint64_t size, RandomSource keys)
+    : m_size(size)
+{
+    const int bits = std::max(2, int(std::bit_width(size > 0 ? size - 1 : 0)));
+    m_halfBits = (bits + 1) / 2;
+    m_halfMask = (std::uint64_t(1) << m_halfBits) - 1;
+    for (std::uint64_t& key : m_keys)
+        key = keys.nextBits();
+}
+
+std::uint64_t PairPermutation::encipher(std::uint64_t value) const
+{
+    std::uint64_t left = value >> m_halfBits;
+    std::uint64_t right = value & m_halfMask;
+    for (const std::uint64_t key : m_keys) {
+        const std::uint64_t next = left ^ (mix(right + key) & m_halfMask);
+        left = right;
+        right = next;
+    }
+    return (left << m_halfBits) | right;
+}
+
+std::uint64_t PairPermutation::at(std::uint64_t index) const
+{
+    // The domain holds less than four times size, so a few walks at most
+    // on average; the walk ends, since a cycle through index holds it.
+    std::uint64_t value = encipher(index);
+    while (value >= m_size)
+        value = encipher(value);
+    return value;
+}
+
+namespace {
+
+// Every item of a pane tidied, in pane order: what independent draws index.
+QStringList tidiedPane(const QStringList& pane)
+{
+    QStringList names;
+    names.reserve(pane.size());
+    for (const QString& name : pane)
+        names.append(tidyName(name));
+    return names;
+}
+
+// The different names of a pane as printed, each once, in the order they
+// first come: names that tidy alike are one name.
+QStringList distinctNames(const QStringList& pane)
+{
+    QStringList names;
+    QSet<QString> seen;
+    for (const QString& name : pane) {
+        QString tidied = tidyName(name);
+        if (!seen.contains(tidied)) {
+            seen.insert(tidied);
+            names.append(std::move(tidied));
+        }
+    }
+    return names;
+}
+
+} // namespace
+
+NameRun::NameRun(const QStringList& firstPane, const QStringList& lastPane,
+                 const RandomSource& start, const RunOptions& options)
+    : m_options(options)
+    , m_rows(shardRows(options.count, options.shard, options.shards, options.shardUnit))
+    , m_firstNames(options.unique ? distinctNames(firstPane) : tidiedPane(firstPane))
+    , m_lastNames(options.unique ? distinctNames(lastPane) : tidiedPane(lastPane))
+    , m_start(start)
+    , m_permutation(std::uint64_t(m_firstNames.size()) * std::uint64_t(m_lastNames.size()), start)
+{
+    if (options.unique && std::uint64_t(options.count) > m_permutation.size())
+        throw Failure(u"These lists make %1 different names: ask for at most %1, not %2."_s
+                          .arg(m_permutation.size())
+                          .arg(options.count));
+}
+
+void NameRun::pairs(std::int64_t firstRow, std::span<NamePair> out) const
+{
+    const auto lastCount = std::uint64_t(m_lastNames.size());
+    if (m_options.unique) {
+        std::uint64_t row = std::uint64_t(firstRow);
+        for (NamePair& pair : out) {
+            const std::uint64_t number = m_permutation.at(row++);
+            pair = {std::uint32_t(number / lastCount), std::uint32_t(number % lastCount)};
+        }
+        return;
+    }
+    RandomSource random = m_start;
+    random.jump(2 * std::uint64_t(firstRow));
+    const int firstCount = int(m_firstNames.size());
+    for (NamePair& pair : out)
+        pair = drawPositions(random, firstCount, int(lastCount));
+}
