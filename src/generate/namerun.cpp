@@ -11,11 +11,12 @@ using namespace Qt::StringLiterals;
 RowRange shardRows(std::int64_t count, int shard, int shards, std::int64_t unit)
 {
     // Whole units, the last one perhaps short, shared out as evenly as the
-    // units allow; 128-bit products, since count may be near 2^63.
+    // units allow: floor(units * i / shards), worked out so that nothing
+    // overflows however near count is to 2^63.
     const std::int64_t units = count / unit + (count % unit != 0 ? 1 : 0);
-    const auto boundary = [&](int i) {
-        const auto unitsBefore = std::int64_t(__int128(units) * i / shards);
-        return std::min<std::int64_t>(count, unitsBefore * unit);
+    const auto boundary = [&](std::int64_t i) {
+        const std::int64_t unitsBefore = units / shards * i + units % shards * i / shards;
+        return unitsBefore >= units ? count : unitsBefore * unit;
     };
     return {boundary(shard - 1), boundary(shard)};
 }
