@@ -27,6 +27,8 @@ packages=(
     fonts-liberation2 xdg-utils
     # for the headless tests and the reading back of saved workbooks
     xvfb xauth dbus python3-openpyxl
+    # for loading quillane-cli's SQL output in a test
+    sqlite3
     # for checking the installed menu entry
     desktop-file-utils
     # for scripts/fuzz.sh (libFuzzer)

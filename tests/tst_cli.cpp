@@ -9,10 +9,20 @@
 #include "support/workbook.h"
 
 #include <QButtonGroup>
+#include <QJsonArray>
+#include <QJsonDocument>
 #include <QLineEdit>
 #include <QPushButton>
 #include <QRadioButton>
+#include <QStandardPaths>
 #include <QTableView>
+
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
+
+extern char** environ;
 
 using namespace Qt::StringLiterals;
 
@@ -40,6 +50,47 @@ Run cli(const QStringList& arguments, const QString& locale = u"C.UTF-8"_s)
     run.out = process.readAllStandardOutput();
     run.err = process.readAllStandardError();
     return run;
+}
+
+// The peak resident memory, in kB, of quillane-cli run with the arguments
+// and its standard output thrown away; -1 when it did not end well.
+long peakKilobytes(const QStringList& arguments)
+{
+    std::vector<QByteArray> bytes{QFile::encodeName(Cli)};
+    for (const QString& argument : arguments)
+        bytes.push_back(argument.toUtf8());
+    std::vector<char*> argv;
+    for (QByteArray& argument : bytes)
+        argv.push_back(argument.data());
+    argv.push_back(nullptr);
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
+    pid_t pid = 0;
+    const int spawned = posix_spawn(&pid, argv[0], &actions, nullptr, argv.data(), environ);
+    posix_spawn_file_actions_destroy(&actions);
+    if (spawned != 0)
+        return -1;
+    int status = 0;
+    rusage usage{};
+    wait4(pid, &status, 0, &usage);
+    return WIFEXITED(status) && WEXITSTATUS(status) == 0 ? usage.ru_maxrss : -1;
+}
+
+// Rows as another program read them back: one JSON array [first, last] a
+// line.
+QList<QStringList> readBack(const QByteArray& printed)
+{
+    QList<QStringList> rows;
+    for (const QByteArray& line : printed.split('\n')) {
+        if (line.isEmpty())
+            continue;
+        QStringList row;
+        for (const QJsonValue& value : QJsonDocument::fromJson(line).array())
+            row.append(value.toString());
+        rows.append(row);
+    }
+    return rows;
 }
 
 QStringList lines(const QByteArray& bytes)
@@ -423,6 +474,150 @@ private Q_SLOTS:
         QCOMPARE(process.exitCode(), 1);
         QCOMPARE(process.readAllStandardError(),
                  QByteArray("quillane-cli: standard output: No space left on device\n"));
+    }
+
+    // No two names alike, counted as printed: a list of three first names
+    // and two last names, once their duplicates and the names that tidy
+    // alike are gone, makes all six pairs and no seventh.
+    void uniqueNamesAtTheEdge()
+    {
+        insertRows(db, u"user_firstname"_s, u"firstname"_s,
+                   {u"ann"_s, u"Bob"_s, u"mary ann"_s, u"Maryann"_s, u"ANN"_s});
+        insertRows(db, u"user_lastname"_s, u"lastname"_s, {u"Lee"_s, u"lee"_s, u"Moss"_s});
+        const QStringList generate{u"generate"_s, u"--unique"_s, u"--list"_s, u"user"_s, u"-n"_s};
+        const Run all = run(generate + QStringList{u"6"_s});
+        QCOMPARE(all.status, 0);
+        QStringList names = lines(all.out);
+        names.sort();
+        QCOMPARE(names, (QStringList{u"Ann Lee"_s, u"Ann Moss"_s, u"Bob Lee"_s, u"Bob Moss"_s,
+                                     u"Maryann Lee"_s, u"Maryann Moss"_s}));
+
+        const Run tooMany = run(generate + QStringList{u"7"_s});
+        QCOMPARE(tooMany.status, 1);
+        QVERIFY(tooMany.out.isEmpty());
+        QCOMPARE(tooMany.err, "quillane-cli: These lists make 6 different names: ask for at most "
+                              "6, not 7.\n");
+    }
+
+    // With one seed, shards 1 to N one after another are the whole run, for
+    // counts that N does not divide, with and without --unique; and the
+    // thread count changes no byte.
+    void shardsMakeTheWholeRun_data()
+    {
+        QTest::addColumn<QStringList>("options");
+        QTest::newRow("lines") << QStringList{u"-n"_s, u"10"_s};
+        QTest::newRow("csv, unique")
+            << QStringList{u"-n"_s, u"101"_s, u"--format"_s, u"csv"_s, u"--unique"_s};
+        QTest::newRow("sql, unique")
+            << QStringList{u"-n"_s, u"2500"_s, u"--format"_s, u"sql"_s, u"--unique"_s};
+        QTest::newRow("tsv, several blocks")
+            << QStringList{u"-n"_s, u"70001"_s, u"--format"_s, u"tsv"_s};
+        QTest::newRow("jsonl, unique, several blocks")
+            << QStringList{u"-n"_s, u"70001"_s, u"--format"_s, u"jsonl"_s, u"--unique"_s};
+    }
+
+    void shardsMakeTheWholeRun()
+    {
+        QFETCH(QStringList, options);
+        const QStringList generate = QStringList{u"generate"_s, u"--seed"_s, u"5"_s} + options;
+        const Run whole = run(generate + QStringList{u"--threads"_s, u"1"_s});
+        QCOMPARE(whole.status, 0);
+        QCOMPARE(run(generate + QStringList{u"--threads"_s, u"4"_s}).out, whole.out);
+        for (const int shards : {1, 2, 3, 7}) {
+            QByteArray joined;
+            for (int shard = 1; shard <= shards; ++shard) {
+                const Run part =
+                    run(generate + QStringList{u"--shard"_s, u"%1/%2"_s.arg(shard).arg(shards)});
+                QCOMPARE(part.status, 0);
+                joined += part.out;
+            }
+            QVERIFY2(joined == whole.out, qPrintable(u"%1 shards"_s.arg(shards)));
+        }
+    }
+
+    // Each format loads in a program that reads it: Python's csv and json,
+    // the sqlite3 shell. Quotes, backslashes, commas, tabs and letters
+    // beyond ASCII come back as the lines format prints them. The file's
+    // ending chooses the format, in any capitals.
+    void formatsLoadInOtherPrograms_data()
+    {
+        QTest::addColumn<QString>("file");
+        QTest::addColumn<QString>("reader");
+        QTest::addColumn<QStringList>("arguments"); // %1 the file
+        QTest::addColumn<QByteArray>("input");      // %1 the file
+        const QString python = u"/usr/bin/python3"_s;
+        const QString csv =
+            u"import csv, json, sys\n"
+            u"rows = list(csv.reader(open(sys.argv[1], newline='', encoding='utf-8'), "
+            u"delimiter=sys.argv[2]))\n"
+            u"assert rows[0] == ['first_name', 'last_name'], rows[0]\n"
+            u"for row in rows[1:]: print(json.dumps(row))\n"_s;
+        QTest::newRow("csv") << u"names.csv"_s << python
+                             << QStringList{u"-c"_s, csv, u"%1"_s, u","_s} << QByteArray();
+        QTest::newRow("tsv") << u"names.TSV"_s << python
+                             << QStringList{u"-c"_s, csv, u"%1"_s, u"\t"_s} << QByteArray();
+        QTest::newRow("jsonl")
+            << u"names.jsonl"_s << python
+            << QStringList{u"-c"_s,
+                           u"import json, sys\n"
+                           u"for line in open(sys.argv[1], encoding='utf-8'):\n"
+                           u"    row = json.loads(line)\n"
+                           u"    assert list(row) == ['first_name', 'last_name'], row\n"
+                           u"    print(json.dumps([row['first_name'], row['last_name']]))\n"_s,
+                           u"%1"_s}
+            << QByteArray();
+        QTest::newRow("sql") << u"names.Sql"_s << u"sqlite3"_s << QStringList{u"-batch"_s}
+                             << QByteArray("create table \"test people\" (first_name text, "
+                                           "last_name text);\n"
+                                           ".read '%1'\n"
+                                           "select json_array(first_name, last_name) from "
+                                           "\"test people\" order by rowid;\n");
+    }
+
+    void formatsLoadInOtherPrograms()
+    {
+        QFETCH(QString, file);
+        QFETCH(QString, reader);
+        QFETCH(QStringList, arguments);
+        QFETCH(QByteArray, input);
+        if (QStandardPaths::findExecutable(reader).isEmpty())
+            QSKIP(qPrintable(reader + u" is not installed"_s));
+        insertRows(db, u"user_firstname"_s, u"firstname"_s,
+                   {u"o\"hara"_s, u"back\\slash"_s, u"comma,jr"_s, u"tab\there"_s, u"zo\u00eb"_s,
+                    u"d'arcy"_s, u"\u00c5SA"_s});
+        insertRows(db, u"user_lastname"_s, u"lastname"_s,
+                   {u"m\u00fcller"_s, u"semi;colon"_s, u"x\"y,z"_s, u"a\tb"_s, u"ends\\"_s});
+        const QStringList generate{u"generate"_s, u"-n"_s,   u"35"_s,     u"--unique"_s,
+                                   u"--list"_s,   u"user"_s, u"--seed"_s, u"11"_s};
+        QList<QStringList> expected;
+        for (const QString& line : lines(run(generate).out))
+            expected.append({line.section(u' ', 0, 0), line.section(u' ', 1)});
+        QCOMPARE(expected.size(), 35);
+
+        const QString path = env->filePath(file);
+        QStringList options{u"-o"_s, path};
+        if (file.endsWith(u".Sql"_s))
+            options << u"--table"_s << u"test people"_s;
+        const Run written = run(generate + options);
+        QCOMPARE(written.status, 0);
+        QProcess process;
+        process.start(reader, arguments.replaceInStrings(u"%1"_s, path));
+        process.write(input.replace("%1", QFile::encodeName(path)));
+        process.closeWriteChannel();
+        QVERIFY(process.waitForFinished(60000));
+        QVERIFY2(process.exitCode() == 0, process.readAllStandardError().constData());
+        QCOMPARE(readBack(process.readAllStandardOutput()), expected);
+    }
+
+    // Memory does not grow with the count: fifty times the names, about the
+    // same peak (a run that kept its rows would need 8 bytes a row more).
+    void memoryDoesNotGrowWithTheCount()
+    {
+        const QStringList generate{u"--database"_s, db, u"generate"_s, u"-n"_s};
+        const long few = peakKilobytes(generate + QStringList{u"100000"_s});
+        const long many = peakKilobytes(generate + QStringList{u"5000000"_s});
+        QVERIFY(few > 0 && many > 0);
+        QVERIFY2(many < few + 16 * 1024, qPrintable(u"%1 kB, then %2 kB"_s.arg(few).arg(many)));
     }
 };
 
