@@ -5,6 +5,7 @@
 #include <QSet>
 
 #include <bit>
+#include <utility>
 
 using namespace Qt::StringLiterals;
 
@@ -35,29 +36,36 @@ std::uint64_t mix(std::uint64_t z)
 PairPermutation::PairPermutation(std::uint64_t size, RandomSource keys)
     : m_size(size)
 {
+    // The fewest bits that hold every number below size: the domain is less
+    // than twice the range, so an index is enciphered less than twice on
+    // average.
     const int bits = std::max(2, int(std::bit_width(size > 0 ? size - 1 : 0)));
-    m_halfBits = (bits + 1) / 2;
-    m_halfMask = (std::uint64_t(1) << m_halfBits) - 1;
+    m_leftBits = bits / 2;
+    m_rightBits = bits - m_leftBits;
     for (std::uint64_t& key : m_keys)
         key = keys.nextBits();
 }
 
 std::uint64_t PairPermutation::encipher(std::uint64_t value) const
 {
-    std::uint64_t left = value >> m_halfBits;
-    std::uint64_t right = value & m_halfMask;
+    // An unbalanced network when the bits are odd: the halves trade places
+    // and widths each round, and each round is a permutation of the bits.
+    int leftBits = m_leftBits;
+    int rightBits = m_rightBits;
+    std::uint64_t left = value >> rightBits;
+    std::uint64_t right = value & ((std::uint64_t(1) << rightBits) - 1);
     for (const std::uint64_t key : m_keys) {
-        const std::uint64_t next = left ^ (mix(right + key) & m_halfMask);
+        const std::uint64_t next = left ^ (mix(right + key) & ((std::uint64_t(1) << leftBits) - 1));
         left = right;
         right = next;
+        std::swap(leftBits, rightBits);
     }
-    return (left << m_halfBits) | right;
+    return (left << rightBits) | right;
 }
 
 std::uint64_t PairPermutation::at(std::uint64_t index) const
 {
-    // The domain holds less than four times size, so a few walks at most
-    // on average; the walk ends, since a cycle through index holds it.
+    // The walk ends: the cycle of the permutation through index holds index.
     std::uint64_t value = encipher(index);
     while (value >= m_size)
         value = encipher(value);

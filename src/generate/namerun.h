@@ -33,11 +33,12 @@ struct RowRange {
 RowRange shardRows(std::int64_t count, int shard, int shards, std::int64_t unit = 1);
 
 // A keyed pseudo-random permutation of 0 .. size-1, for sizes up to 2^62:
-// a balanced Feistel network of eight rounds over the smallest even number
-// of bits that holds size-1, its round function the SplitMix64 finaliser of
-// the half and a round key; a result outside the range is enciphered again
-// (cycle walking) until it falls inside, which keeps it a permutation of
-// exactly size elements. It needs no memory beyond its keys.
+// a Feistel network of eight rounds over the fewest bits that hold size-1
+// (unbalanced by one bit when they are odd), its round function the
+// SplitMix64 finaliser of a half plus a round key; a result outside the
+// range is enciphered again (cycle walking) until it falls inside, which
+// keeps it a permutation of exactly size elements. It needs no memory
+// beyond its keys.
 class PairPermutation {
 public:
     // The round keys are the next draws of keys.
@@ -51,8 +52,8 @@ private:
     std::uint64_t encipher(std::uint64_t value) const;
 
     std::uint64_t m_size;
-    int m_halfBits = 1;
-    std::uint64_t m_halfMask = 1;
+    int m_leftBits = 1;
+    int m_rightBits = 1;
     std::array<std::uint64_t, Rounds> m_keys{};
 };
 
