@@ -359,8 +359,9 @@ private:
     // Bytes to standard output, flushed to the end when asked.
     void write(QByteArrayView bytes, bool flush = true) const
     {
-        if (std::fwrite(bytes.data(), 1, std::size_t(bytes.size()), m_out)
-                != std::size_t(bytes.size())
+        if ((!bytes.isEmpty()
+             && std::fwrite(bytes.data(), 1, std::size_t(bytes.size()), m_out)
+                    != std::size_t(bytes.size()))
             || (flush && std::fflush(m_out) != 0))
             throw Failure(
                 u"standard output: %1"_s.arg(QString::fromLocal8Bit(std::strerror(errno))));

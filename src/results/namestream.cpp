@@ -148,8 +148,12 @@ public:
         m_starts.reserve(std::size_t(names.size()) + 1);
         m_starts.push_back(0);
         for (const QString& name : names) {
+            // Through a QByteArray: appending the encoder's result itself
+            // reserves the exact size each time, and the table would be
+            // copied once per name as it grows.
+            const QByteArray encoded = encoder.encode(layout.field(name));
             m_bytes += before;
-            m_bytes += encoder.encode(layout.field(name));
+            m_bytes += encoded;
             m_bytes += after;
             m_longest = std::max(m_longest, m_bytes.size() - m_starts.back());
             m_starts.push_back(std::uint32_t(m_bytes.size()));
