@@ -465,11 +465,21 @@ private Q_SLOTS:
         QVERIFY2(QString::fromUtf8(result.out).startsWith(start), result.out.constData());
     }
 
+    // A list, and a stream cut off while its threads are still making rows.
+    void aFullStandardOutputIsAFailure_data()
+    {
+        QTest::addColumn<QStringList>("command");
+        QTest::newRow("names") << QStringList{u"names"_s, u"last"_s};
+        QTest::newRow("generate on threads")
+            << QStringList{u"generate"_s, u"-n"_s, u"3000000"_s, u"--threads"_s, u"4"_s};
+    }
+
     void aFullStandardOutputIsAFailure()
     {
+        QFETCH(QStringList, command);
         QProcess process;
         process.setStandardOutputFile(u"/dev/full"_s);
-        process.start(Cli, {u"--database"_s, db, u"names"_s, u"last"_s});
+        process.start(Cli, QStringList{u"--database"_s, db} + command);
         QVERIFY(process.waitForFinished(60000));
         QCOMPARE(process.exitCode(), 1);
         QCOMPARE(process.readAllStandardError(),
