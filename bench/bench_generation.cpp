@@ -81,8 +81,7 @@ void benchClick(const QString& folder)
 
 void benchCore(const QString& databasePath)
 {
-    Bench::NoPointer pointer;
-    NameLists lists(databasePath, pointer);
+    NameLists lists(databasePath);
     lists.RefreshLists(ListChoice{true, false, true, false, false});
     RandomSource random;
     random.seed(7);

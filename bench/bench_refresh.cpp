@@ -1,6 +1,5 @@
 // Times RefreshLists: on the shipped database with "Both" chosen, and on a
 // user list of a million first and a million last names.
-#include "base/pointer.h"
 #include "benchsupport.h"
 #include "names/namelists.h"
 
@@ -67,8 +66,7 @@ int main(int argc, char** argv)
     QTemporaryDir dir;
     const QString path = Bench::shippedDatabaseCopy(dir);
 
-    Bench::NoPointer pointer;
-    NameLists lists(path, pointer);
+    NameLists lists(path);
     const double builtIn = medianMs(lists, ListChoice{true, false, true, false, false}, 9);
     std::printf(
         "RefreshLists, built-in list, Both: %lld + %lld names, median %.1f ms (goal 100 ms)\n",

@@ -107,7 +107,7 @@ int main(int argc, char** argv)
         const double cpuStart = Bench::processorMs();
         const QByteArray text = resultsText(rows);
         building.push_back(double(timer.nsecsElapsed()) / 1e6);
-        WriteTextFile(text, path);
+        WriteTextFile(text, path, QString());
         times.push_back(double(timer.nsecsElapsed()) / 1e6);
         cpu.push_back(Bench::processorMs() - cpuStart);
     }

@@ -5,7 +5,6 @@
 // memory.
 
 #include "base/dialogs.h"
-#include "base/pointer.h"
 #include "base/shell.h"
 
 #include <QFile>
@@ -36,12 +35,6 @@ class NoShell : public Shell {
 public:
     void openWebPage(const QUrl&) override {}
     void openDocument(const QString&) override {}
-};
-
-class NoPointer : public PointerOwner {
-public:
-    int mousePointer() const override { return 0; }
-    void setMousePointer(int) override {}
 };
 
 // A writable copy of the shipped names database in folder.

@@ -3,15 +3,21 @@
 # absent, relative symlinks, a desktop entry that names the prefix chosen at
 # install time, and the drawn icons renamed into the icon theme's folders.
 #
-# Expects QUILLANE_BUILT_DB, QUILLANE_INSTALL_FOLDER, QUILLANE_PROGRAMS,
+# Expects QUILLANE_BUILT_DB, QUILLANE_SHIPPED_DB, QUILLANE_INSTALL_FOLDER, QUILLANE_PROGRAMS,
 # QUILLANE_ARTWORK_DIR and QUILLANE_DESKTOP_TEMPLATE.
 
 set(quillane_root "$ENV{DESTDIR}${CMAKE_INSTALL_PREFIX}")
 set(quillane_folder "${quillane_root}/${QUILLANE_INSTALL_FOLDER}")
 
-# The names database: the user's own list once installed.
+# The names database: the user's own list once installed. A package gets
+# the lists as shipped; each user's names go to a copy of their own.
 set(quillane_db "${quillane_folder}/names.mdb")
-if(EXISTS "${quillane_db}")
+if(DEFINED ENV{QUILLANE_PACKAGING})
+    file(MAKE_DIRECTORY "${quillane_folder}")
+    file(COPY_FILE "${QUILLANE_SHIPPED_DB}" "${quillane_db}")
+    message(STATUS "Installing: ${quillane_db} (the lists as shipped)")
+    list(APPEND CMAKE_INSTALL_MANIFEST_FILES "${quillane_db}")
+elseif(EXISTS "${quillane_db}")
     message(STATUS "Keeping: ${quillane_db} (it holds your own names and is never replaced)")
 elseif(NOT EXISTS "${QUILLANE_BUILT_DB}")
     message(FATAL_ERROR "${QUILLANE_BUILT_DB} is missing: build Quillane before installing it.")

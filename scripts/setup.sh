@@ -1,19 +1,22 @@
 #!/usr/bin/env bash
-# Sets up a Debian 12 machine for Quillane, builds it, and then either starts
-# the program or runs every test headless.
+# Sets up a Debian 12 machine for Quillane, builds it, and then starts the
+# program, runs every test headless, or makes the Debian package.
 #
-#   scripts/setup.sh run     install what is missing, build, start the program
-#   scripts/setup.sh test    install what is missing, build, run all tests
-#   scripts/setup.sh build   install what is missing, build (for other scripts)
+#   scripts/setup.sh run      install what is missing, build, start the program
+#   scripts/setup.sh test     install what is missing, build, run all tests
+#   scripts/setup.sh package  install what is missing, build, make
+#                             build/quillane_<version>_<arch>.deb
+#   scripts/setup.sh build    install what is missing, build (for other scripts)
 #
 # Environment: BUILD_DIR (default: build), QUILLANE_WERROR=ON to fail on
-# warnings, QUILLANE_SANITIZE=ON for an AddressSanitizer/UBSan build.
+# warnings, QUILLANE_SANITIZE=ON for an AddressSanitizer/UBSan build,
+# QUILLANE_COVERAGE=ON for a build that counts coverage (scripts/coverage.sh).
 set -euo pipefail
 
 mode=${1:-}
 case "$mode" in
-    run|test|build) ;;
-    *) echo "usage: $0 run|test|build" >&2; exit 2 ;;
+    run|test|package|build) ;;
+    *) echo "usage: $0 run|test|package|build" >&2; exit 2 ;;
 esac
 
 top=$(cd "$(dirname "$0")/.." && pwd)
@@ -29,8 +32,10 @@ packages=(
     xvfb xauth dbus python3-openpyxl
     # for loading quillane-cli's SQL output in a test
     sqlite3
-    # for checking the installed menu entry
-    desktop-file-utils
+    # for the package (dpkg-shlibdeps, file) and for checking what it holds
+    dpkg-dev file lintian appstream desktop-file-utils bash-completion
+    # for scripts/coverage.sh
+    gcovr
     # for scripts/fuzz.sh (libFuzzer)
     clang libclang-rt-14-dev
 )
@@ -40,12 +45,28 @@ install_missing "${packages[@]}"
 cmake -S "$top" -B "$build" -G Ninja \
     -DCMAKE_BUILD_TYPE="${CMAKE_BUILD_TYPE:-Release}" \
     -DQUILLANE_WERROR="${QUILLANE_WERROR:-OFF}" \
-    -DQUILLANE_SANITIZE="${QUILLANE_SANITIZE:-OFF}"
+    -DQUILLANE_SANITIZE="${QUILLANE_SANITIZE:-OFF}" \
+    -DQUILLANE_COVERAGE="${QUILLANE_COVERAGE:-OFF}"
 cmake --build "$build"
 
 case "$mode" in
     run) exec "$build/bin/quillane" ;;
     build) exit 0 ;;
+    package)
+        # cpack's install writes the build's install_manifest.txt, which is
+        # the record of an install of your own (and what removing it reads):
+        # it is put back as it was.
+        manifest="$build/install_manifest.txt"
+        saved="$build/install_manifest.txt.saved"
+        rm -f "$saved" "$build"/quillane_*.deb
+        [ ! -e "$manifest" ] || mv "$manifest" "$saved"
+        status=0
+        (cd "$build" && cpack -G DEB) || status=$?
+        rm -f "$manifest"
+        [ ! -e "$saved" ] || mv "$saved" "$manifest"
+        [ "$status" -eq 0 ] || exit "$status"
+        ls "$build"/quillane_*.deb
+        exit 0 ;;
 esac
 
 export QT_QPA_PLATFORM=offscreen

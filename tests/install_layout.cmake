@@ -153,6 +153,19 @@ foreach(icon IN LISTS icons)
     expect_same("${prefix}/share/icons/hicolor/${size}x${size}/apps/quillane.png" "${icon}")
 endforeach()
 
+# The manual pages, completion and metadata, where man, bash and software
+# centres look below a prefix.
+set(extras share/metainfo/org.quillane.Quillane.metainfo.xml share/doc/quillane/copyright)
+if(WITH_CLI)
+    list(APPEND extras share/man/man1/quillane.1.gz share/man/man1/quillane-cli.1.gz
+         share/bash-completion/completions/quillane-cli)
+endif()
+foreach(extra IN LISTS extras)
+    if(NOT EXISTS "${prefix}/${extra}")
+        fail("${prefix}/${extra} was not installed")
+    endif()
+endforeach()
+
 # --- Installing again over a changed install ------------------------------
 # The user's list has grown; the program's own files were damaged or are
 # from an older install. Installing again mends the files and keeps the list.

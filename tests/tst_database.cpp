@@ -3,16 +3,18 @@
 #include "base/failure.h"
 #include "names/database.h"
 #include "names/namelists.h"
-#include "support/fakepointer.h"
 #include "support/testenvironment.h"
 
 #include <QFile>
 #include <QTest>
+#include <QThread>
+
+#include <sqlite3.h>
+
+#include <optional>
+#include <thread>
 
 using namespace Qt::StringLiterals;
-
-const QStringList Tables{u"system_mfirstname"_s, u"system_ffirstname"_s, u"system_lastname"_s,
-                         u"user_firstname"_s, u"user_lastname"_s};
 
 class TestDatabase : public QObject {
     Q_OBJECT
@@ -24,7 +26,7 @@ class TestDatabase : public QObject {
     QStringList everything() const
     {
         QStringList all;
-        for (const QString& table : Tables)
+        for (const QString& table : DatabaseTables)
             all.append(tableColumn(m_path, table, u"*"_s).join(u','));
         return all;
     }
@@ -53,9 +55,11 @@ private Q_SLOTS:
         QTest::addColumn<QString>("lastNames");
         QTest::addColumn<QString>("failure");
 
-        // The options: built-in, user; both, male, female.
-        const ListChoice both{1, 0, 1, 0, 0}, male{1, 0, 0, 1, 0}, female{1, 0, 0, 0, 1};
-        const ListChoice user{0, 1, 1, 0, 0}, noGender{1, 0, 0, 0, 0}, noSource{0, 0, 1, 0, 0};
+        // Each as it differs from the first start's choice: the built-in list, both genders.
+        const ListChoice both{}, male{.both = false, .male = true};
+        const ListChoice female{.both = false, .female = true};
+        const ListChoice user{.builtIn = false, .user = true}, noGender{.both = false};
+        const ListChoice noSource{.builtIn = false};
         const QString last = u"ADAMS,Jones,Jones,smith"_s, kept = u"kept"_s;
         const auto row = [](const char* tag, ListChoice c, QString f, QString l, QString e = {}) {
             QTest::newRow(tag) << c << f << l << e; // choice, the two panes, the failure
@@ -66,8 +70,14 @@ private Q_SLOTS:
         row("user: duplicates twice", user, u"AL,Bo,Bo,cleo"_s, u"de Vries,Yu"_s);
         row("no gender selected", noGender, kept, last);
         row("no source selected", noSource, kept, kept);
-        row("missing", both, kept, kept, u"unable to open database file"_s);
-        row("corrupt", both, kept, kept, u"file is not a database"_s);
+        // A failure names the file; one that is not ours says so.
+        const QString notOurs = u"The file %1 is not a Quillane names database."_s.arg(m_path);
+        row("missing", both, kept, kept, m_path + u": unable to open database file"_s);
+        row("corrupt", both, kept, kept, notOurs);
+        row("empty", both, kept, kept, notOurs);
+        row("foreign", user, kept, kept, notOurs);
+        // Another program writing for a moment is waited for.
+        row("busy", user, u"AL,Bo,Bo,cleo"_s, u"de Vries,Yu"_s);
     }
 
     void panesShowEachQuery()
@@ -80,8 +90,26 @@ private Q_SLOTS:
             QVERIFY(db.remove());
         if (database == "corrupt") // written over the database
             QVERIFY(db.open(QIODevice::WriteOnly) && db.write(QByteArray(999, 'x')) && db.flush());
-        FakePointer pointer;
-        NameLists lists(m_path, pointer);
+        if (database == "empty")
+            QVERIFY(db.resize(0));
+        if (database == "foreign") { // another program's database
+            QVERIFY(db.remove());
+            sqlite3* other = nullptr;
+            sqlite3_open(QFile::encodeName(m_path).constData(), &other);
+            QCOMPARE(sqlite3_exec(other, "create table t (x)", nullptr, nullptr, nullptr), 0);
+            sqlite3_close(other);
+        }
+        std::optional<Connection> writer;
+        std::thread release;
+        if (database == "busy") {
+            writer.emplace(m_path);
+            writer->execute("begin exclusive");
+            release = std::thread([&] {
+                QThread::msleep(300);
+                writer->execute("commit");
+            });
+        }
+        NameLists lists(m_path);
         lists.firstPane().setNames({u"kept"_s});
         lists.lastPane().setNames({u"kept"_s});
         QString failure;
@@ -90,10 +118,11 @@ private Q_SLOTS:
         } catch (const Failure& f) {
             failure = f.description();
         }
+        if (release.joinable())
+            release.join();
         QTEST(failure, "failure");
         QTEST(lists.firstPane().names().join(u','), "firstNames");
         QTEST(lists.lastPane().names().join(u','), "lastNames");
-        QCOMPARE(pointer.history, (QList<int>{MousePointer::Hourglass, MousePointer::Default}));
         QCOMPARE(QFile::exists(m_path), database != "missing");
     }
 
@@ -126,16 +155,52 @@ private Q_SLOTS:
         // The table a statement names: "insert into T ...", "delete from T ...".
         const QString table = QString::fromLatin1(sql).section(u' ', 2, 2);
         QStringList expected = everything();
-        expected[Tables.indexOf(table)] = rows;
+        expected[DatabaseTables.indexOf(table)] = rows;
         Connection c(m_path);
         name.isNull() ? c.execute(sql.constData()) : c.execute(sql.constData(), name);
         QCOMPARE(everything(), expected);
     }
 
+    // Only commit() keeps a transaction's work: a failure that unwinds through
+    // it, whether a statement's or the caller's, leaves every table as it was.
+    void aTransactionKeepsOnlyWhatIsCommitted_data()
+    {
+        QTest::addColumn<QString>("end"); // how the transaction ends after two inserts
+        QTest::addColumn<QString>("rows");
+        QTest::newRow("commit") << u"commit"_s << u"Yu,de Vries,Ann,Bo"_s;
+        QTest::newRow("rollback") << u"rollback"_s << u"Yu,de Vries"_s;
+        QTest::newRow("the caller fails") << u"throw"_s << u"Yu,de Vries"_s;
+        QTest::newRow("a statement fails") << u"refused"_s << u"Yu,de Vries"_s;
+    }
+
+    void aTransactionKeepsOnlyWhatIsCommitted()
+    {
+        QFETCH(QString, end);
+        Connection db(m_path);
+        db.execute("create trigger refuse before insert on user_lastname when new.lastname = "
+                   "'Bad' begin select raise(abort, 'no'); end");
+        try {
+            Connection::Transaction transaction(db);
+            db.execute(Sql::InsertUserLastName, u"Ann"_s);
+            db.execute(Sql::InsertUserLastName, u"Bo"_s);
+            if (end == u"commit")
+                transaction.commit();
+            else if (end == u"rollback")
+                transaction.rollback();
+            else if (end == u"throw")
+                throw Failure(u"the caller's"_s);
+            else
+                db.execute(Sql::InsertUserLastName, u"Bad"_s);
+        } catch (const Failure&) {
+        }
+        QVERIFY(!db.inTransaction());
+        QTEST(tableColumn(m_path, u"user_lastname"_s, u"*"_s).join(u','), "rows");
+    }
+
     void shippedDatabaseHoldsTheBuiltInLists()
     {
         QList<qsizetype> counts;
-        for (const QString& table : Tables)
+        for (const QString& table : DatabaseTables)
             counts.append(tableColumn(QStringLiteral(QUILLANE_SHIPPED_DB), table, u"*"_s).size());
         QCOMPARE(counts, (QList<qsizetype>{1219, 4275, 88799, 0, 0}));
     }

@@ -1,11 +1,12 @@
-// The error report and the trap that shows it.
+// The error report and the trap that shows it, and control characters
+// escaped in the messages of both front ends.
 #include "base/errorreport.h"
 #include "base/failure.h"
 #include "base/trap.h"
 #include "names/namelists.h"
 #include "support/fakedialogs.h"
-#include "support/fakepointer.h"
 
+#include <QProcess>
 #include <QTest>
 
 using namespace Qt::StringLiterals;
@@ -14,42 +15,32 @@ class TestErrorReport : public QObject {
     Q_OBJECT
 
 private Q_SLOTS:
-    void reportText_data()
-    {
-        QTest::addColumn<QString>("description");
-        QTest::addColumn<QString>("location");
-        QTest::addColumn<int>("line");
-        QTest::addColumn<ClosingLine>("closing");
-        QTest::addColumn<QString>("expected");
-
-        QTest::newRow("long closing line")
-            << u"Disk full"_s << u"in Tessmark.Form1.PushButton2_Click "_s << 30
-            << ClosingLine::Long
-            << u"Disk full\r\nin Tessmark.Form1.PushButton2_Click at line 30\r\r"
-               "Please email screenshot of this message to support@quillane.org"_s;
-        QTest::newRow("short closing line")
-            << u"Overflow"_s << u"in Tessmark.Form1.PushButton1_Click "_s << 120
-            << ClosingLine::Short
-            << u"Overflow\r\nin Tessmark.Form1.PushButton1_Click at line 120\r\r"
-               "Please email support@quillane.org"_s;
-        QTest::newRow("empty description gives an empty first line")
-            << QString() << u"in Tessmark.Main.FileToListview "_s << 5 << ClosingLine::Long
-            << u"\r\nin Tessmark.Main.FileToListview at line 5\r\r"
-               "Please email screenshot of this message to support@quillane.org"_s;
-    }
-
+    // What failed, where and at which step, and whom to tell; the short
+    // closing line leaves the screenshot out.
     void reportText()
     {
-        QFETCH(QString, description);
-        QFETCH(QString, location);
-        QFETCH(int, line);
-        QFETCH(ClosingLine, closing);
-        QFETCH(QString, expected);
         FakeDialogs dialogs;
-        ShowErrorReport(dialogs, description, location, line, closing);
-        QCOMPARE(dialogs.messages(), QStringList{expected});
+        for (const ClosingLine closing : {ClosingLine::Long, ClosingLine::Short})
+            ShowErrorReport(dialogs, u"Disk full"_s, u"in Tessmark.Form1.PushButton2_Click "_s, 30,
+                            closing);
+        const QString start = u"Disk full\r\nin Tessmark.Form1.PushButton2_Click at line 30\r\r"_s;
+        QCOMPARE(dialogs.messages(),
+                 (QStringList{start + u"Please email screenshot of this message to "_s
+                                  + u"support@quillane.org"_s,
+                              start + u"Please email support@quillane.org"_s}));
         QCOMPARE(dialogs.shown[0].title, u"Application Error"_s);
         QCOMPARE(dialogs.shown[0].icon, MessageIcon::Exclamation);
+    }
+
+    // A name read from a file must not drive the terminal or the box.
+    void controlCharactersShownEscaped()
+    {
+        FakeDialogs dialogs;
+        ShowErrorReport(dialogs,
+                        u"Bad\x1b[2J\x1b]0;title\x07name\tx\ry\x7f\u009b\u2028 A\u0308\nNext line"_s,
+                        u"in Tessmark.Main.FileToListview "_s, 5, ClosingLine::Long);
+        QCOMPARE(dialogs.messages().value(0).section(u"\r\n"_s, 0, 0),
+                 u"Bad\\x1b[2J\\x1b]0;title\\x07name\\tx\\ry\\x7f\\x9b\\u2028 A\u0308\nNext line"_s);
     }
 
     // Each failing step of a handler is reported under the handler's location
@@ -59,8 +50,7 @@ private Q_SLOTS:
     void aTrapReportsEachFailingStepAndGoesOn()
     {
         FakeDialogs dialogs;
-        FakePointer pointer;
-        NameLists lists(u"/nonexistent/folder/names.mdb"_s, pointer);
+        NameLists lists(u"/nonexistent/folder/names.mdb"_s);
         QStringList ran;
         int turns = 0;
         Trap trap(dialogs, u"in Tessmark.Form1.PushButton8_Click "_s, ClosingLine::Long);
@@ -80,7 +70,33 @@ private Q_SLOTS:
                                    ClosingLine::Long);
         };
         QCOMPARE(dialogs.messages(), (QStringList{report(u"first"_s, 20), report(u"second"_s, 30),
-                                                  report(u"unable to open database file"_s, 40)}));
+                                                  report(u"/nonexistent/folder/names.mdb: unable to open database file"_s, 40)}));
+    }
+
+    void cliComplaintsShowControlCharactersEscaped_data()
+    {
+        QTest::addColumn<QStringList>("arguments");
+        QTest::addColumn<QString>("complaint");
+        QTest::newRow("usage error")
+            << QStringList{u"--x\x1b[2J\ty"_s}
+            << u"quillane-cli: Unknown option '--x\\x1b[2J\\ty'. Try 'quillane-cli --help'.\n"_s;
+        QTest::newRow("failure naming a file")
+            << QStringList{u"--database"_s, u"/nonexistent/\x1b[31mred\u009b/names.mdb"_s,
+                           u"names"_s, u"first"_s}
+            << u"quillane-cli: /nonexistent/\\x1b[31mred\\x9b/names.mdb: unable to open database "
+               "file\n"_s;
+    }
+
+    // What a terminal gets on standard error.
+    void cliComplaintsShowControlCharactersEscaped()
+    {
+        QFETCH(QStringList, arguments);
+        QFETCH(QString, complaint);
+        QProcess cli;
+        cli.start(QStringLiteral(QUILLANE_CLI), arguments);
+        QVERIFY(cli.waitForFinished(60000));
+        QCOMPARE(QString::fromUtf8(cli.readAllStandardError()), complaint);
+        QVERIFY(cli.exitCode() != 0);
     }
 };
 

@@ -6,11 +6,15 @@
 #include "support/fakepointer.h"
 #include "support/testenvironment.h"
 
+#include <QProcess>
 #include <QRandomGenerator>
-#include <QTemporaryFile>
 #include <QTest>
 
 #include <sqlite3.h>
+#include <sys/resource.h>
+#include <unistd.h>
+
+#include <csignal>
 
 using namespace Qt::StringLiterals;
 
@@ -27,18 +31,114 @@ QStringList storable(const QByteArray& bytes)
     return texts;
 }
 
-// The editor over a fresh copy of the shipped database, importing first
-// names into the user list.
+// The editor over a fresh copy of the shipped database (or of another),
+// importing first names into the user list.
 struct Rig {
+    explicit Rig(const QString& database = {})
+        : env(database.isEmpty())
+    {
+        if (!database.isEmpty())
+            QFile::copy(database, db);
+    }
     QStringList firstNames() const { return tableColumn(db, u"user_firstname"_s, u"*"_s); }
 
     TestEnvironment env;
     const QString db = env.databasePath();
     FakePointer pointer;
     ListChoice choice{false, true, true, false, false};
-    NameLists lists{db, pointer};
+    NameLists lists{db};
     ListEditor editor{env.dialogs, db, lists, pointer, [this] { return choice; }};
 };
+
+// A file system over the system's own that fails one write when armed: the
+// n-th write after arming returns an I/O error, as a failing disk would,
+// and every other call goes through. Registered as the default, so the
+// program's own connections use it.
+namespace FaultyDisk {
+
+sqlite3_vfs* system = nullptr;
+sqlite3_vfs vfs;
+sqlite3_io_methods methods;
+int writesToFail = 0; // 0: none
+bool failed = false;
+
+struct File {
+    sqlite3_file base;
+    sqlite3_file* real;
+};
+
+sqlite3_file* real(sqlite3_file* file)
+{
+    return reinterpret_cast<File*>(file)->real;
+}
+
+int write(sqlite3_file* file, const void* data, int amount, sqlite3_int64 offset)
+{
+    if (writesToFail > 0 && --writesToFail == 0) {
+        failed = true;
+        return SQLITE_IOERR_WRITE;
+    }
+    return real(file)->pMethods->xWrite(real(file), data, amount, offset);
+}
+
+int open(sqlite3_vfs*, const char* name, sqlite3_file* base, int flags, int* outFlags)
+{
+    auto* file = reinterpret_cast<File*>(base);
+    file->real = reinterpret_cast<sqlite3_file*>(file + 1);
+    base->pMethods = nullptr;
+    const int rc = system->xOpen(system, name, file->real, flags, outFlags);
+    if (file->real->pMethods)
+        base->pMethods = &methods;
+    return rc;
+}
+
+void install()
+{
+    if (system)
+        return;
+    system = sqlite3_vfs_find(nullptr);
+    vfs = *system;
+    vfs.szOsFile = int(sizeof(File)) + system->szOsFile;
+    vfs.zName = "faulty";
+    vfs.pNext = nullptr;
+    vfs.xOpen = open;
+    // Version 1: no memory mapping and no shared memory, so every write of
+    // the rollback journal and of the database passes through write().
+    methods.iVersion = 1;
+    methods.xClose = [](sqlite3_file* f) { return real(f)->pMethods->xClose(real(f)); };
+    methods.xRead = [](sqlite3_file* f, void* data, int amount, sqlite3_int64 offset) {
+        return real(f)->pMethods->xRead(real(f), data, amount, offset);
+    };
+    methods.xWrite = write;
+    methods.xTruncate = [](sqlite3_file* f, sqlite3_int64 size) {
+        return real(f)->pMethods->xTruncate(real(f), size);
+    };
+    methods.xSync = [](sqlite3_file* f, int flags) {
+        return real(f)->pMethods->xSync(real(f), flags);
+    };
+    methods.xFileSize = [](sqlite3_file* f, sqlite3_int64* size) {
+        return real(f)->pMethods->xFileSize(real(f), size);
+    };
+    methods.xLock = [](sqlite3_file* f, int lock) {
+        return real(f)->pMethods->xLock(real(f), lock);
+    };
+    methods.xUnlock = [](sqlite3_file* f, int lock) {
+        return real(f)->pMethods->xUnlock(real(f), lock);
+    };
+    methods.xCheckReservedLock = [](sqlite3_file* f, int* out) {
+        return real(f)->pMethods->xCheckReservedLock(real(f), out);
+    };
+    methods.xFileControl = [](sqlite3_file* f, int op, void* arg) {
+        return real(f)->pMethods->xFileControl(real(f), op, arg);
+    };
+    methods.xSectorSize = [](sqlite3_file* f) { return real(f)->pMethods->xSectorSize(real(f)); };
+    methods.xDeviceCharacteristics = [](sqlite3_file* f) {
+        return real(f)->pMethods->xDeviceCharacteristics(real(f));
+    };
+    sqlite3_vfs_register(&vfs, 1);
+}
+
+} // namespace FaultyDisk
 
 } // namespace
 
@@ -59,9 +159,18 @@ private Q_SLOTS:
                             const QStringList& reports = {}, const QByteArray& other = {}) {
             QTest::newRow(tag) << files << names << reports << other;
         };
-        const QString at = u"in Tessmark.Main.FileToListview "_s, locked = u"database is locked"_s;
+        // In the reports, %1 stands for the test's folder.
+        const QString at = u"in Tessmark.Main.FileToListview "_s;
+        const QString locked = u"%1/names.mdb: database is locked"_s;
         constexpr ClosingLine Long = ClosingLine::Long;
-        QStringList refusals(ListEditor::MaxReportsPerFile, errorReportText(u"no"_s, at, 50, Long));
+        const auto refused = [&](const QString& text) {
+            return errorReportText(text, at, 50, Long);
+        };
+        const QStringList notText{errorReportText(
+            u"The file %1/0.txt is not text: it holds control characters. Nothing of it was "
+            u"stored."_s,
+            at, 40, Long)};
+        QStringList refusals(ListEditor::MaxReportsPerFile, refused(u"no"_s));
         refusals += errorReportText(u"15 more names of this file were not stored."_s, at, 60, Long);
         row("LF only, no final line end", {"Ann\nBo\nCy"}, u"Ann|Bo|Cy"_s);
         row("CR only", {"Ann\rBo\rCy\r"}, u"Ann|Bo|Cy"_s);
@@ -70,7 +179,25 @@ private Q_SLOTS:
         row("a line of spaces", {"Ann\n  \nBo"}, u"Ann|  |Bo"_s);
         row("O'Brien", {"O'Brien\n'''\n"}, u"OBrien"_s);
         row("byte-order mark", {"\xEF\xBB\xBFZo\xC3\xAB\nBo"}, u"Zoë|Bo"_s);
-        row("NUL, invalid UTF-8", {QByteArray("A\0nn\xFF\nBo", 8)}, u"Ann\uFFFD|Bo"_s);
+        row("UTF-16 with its mark", {QByteArray("\xFF\xFEZ\0o\0\xEB\0\n\0", 10)}, u"Zoë"_s);
+        // Not UTF-8: the code page such lists are saved in on Windows.
+        row("Windows-1252", {"M\xFCller\n\x80uro\nZo\xEB"}, u"Müller|€uro|Zoë"_s);
+        // A file that is not text is refused whole.
+        row("a NUL", {QByteArray("A\0nn\nBo", 7)}, u""_s, notText);
+        row("UTF-16 without its mark", {QByteArray("Z\0o\0\n\0", 6)}, u""_s, notText);
+        row("an escape", {"Ann\n\x1B[2J\nBo"}, u""_s, notText);
+        QByteArray noise(2 << 20, Qt::Uninitialized);
+        QRandomGenerator(42).fillRange(reinterpret_cast<quint32*>(noise.data()), noise.size() / 4);
+        row("random bytes", {noise}, u""_s, notText);
+        // A control character in one name, past the start of the file, or a
+        // tab: that name is refused, with the character written out.
+        const QByteArray start = QByteArray("Ann\n").repeated(17000);
+        row("a control character later", {start + "Es\x1B[2Jc\nBo"},
+            (QStringList(17000, u"Ann"_s) << u"Bo"_s).join(u'|'),
+            {refused(u"The name \"Es\\u001b[2Jc\" holds a control character and was not "
+                     u"stored."_s)});
+        row("a tab", {"Ann\tLee\nBo"}, u"Bo"_s,
+            {refused(u"The name \"Ann\\tLee\" holds a control character and was not stored."_s)});
         row("cancel", {}, u""_s);
         row("several", {"Cy\n", {}, "Ann\n", "Bo\n"}, u"Cy|Ann|Bo"_s, {u"File not found"_s});
         row("a locked database", {"Ann\n"}, u""_s,
@@ -82,12 +209,9 @@ private Q_SLOTS:
             u"Ann|Cy"_s, refusals,
             "create trigger refuse before insert on user_firstname when new.firstname = 'Bad' "
             "begin select raise(abort, 'no'); end");
-        // Read in pieces, or not text at all: the names are those of the whole
-        // file split at once, and the reports are bounded.
+        // Read in pieces: the names are those of the whole file split at
+        // once, and the reports are bounded.
         row("across reads", {QByteArray("\xC3\xAB\n").repeated(100000)}, {});
-        QByteArray noise(2 << 20, Qt::Uninitialized);
-        QRandomGenerator(42).fillRange(reinterpret_cast<quint32*>(noise.data()), noise.size() / 4);
-        row("random bytes", {noise}, {});
         row("a 20 MB line", {QByteArray(20 << 20, 'z') + "\nAfter"}, {});
     }
 
@@ -118,7 +242,7 @@ private Q_SLOTS:
         if (names.isNull())
             QVERIFY(messages.size() <= ListEditor::MaxReportsPerFile + 1);
         else
-            QCOMPARE(messages, reports);
+            QCOMPARE(messages, reports.replaceInStrings(u"%1"_s, rig.env.folder()));
         // The hourglass over the whole import, then once more over the one refresh.
         const QList<int> busy{MousePointer::Hourglass, MousePointer::Default};
         QCOMPARE(rig.pointer.history, paths.isEmpty() ? QList<int>() : busy + busy);
@@ -130,15 +254,138 @@ private Q_SLOTS:
         rig.lists.RefreshLists(rig.choice);
     }
 
-    void aPathInTheRootFolderIsUsedAsGiven()
+    // Every write of a small import, a clear and a delete fails in turn, as
+    // SQLite's own tests fail them: the operation is reported once, naming
+    // the database, and the database holds what it held before (an import
+    // may keep the file's first names, never a later one) and is whole.
+    void aFailingWriteLosesNothing_data()
     {
-        QTemporaryFile rootFile(u"/quillane-import-XXXXXX.txt"_s);
-        if (!rootFile.open() || rootFile.write("Rooted\n") != 7 || !rootFile.flush())
-            QSKIP("the root folder is not writable here");
-        Rig rig;
-        rig.env.dialogs.answerOpen({rootFile.fileName()});
-        rig.editor.PushButton6_Click();
-        QCOMPARE(rig.firstNames(), QStringList{u"Rooted"_s});
+        QTest::addColumn<int>("button"); // 6 imports, 4 clears or deletes first names
+        QTest::addColumn<ListChoice>("choice");
+        QTest::addColumn<QStringList>("after"); // the first names when nothing fails
+        const ListChoice user{false, true, true, false, false},
+            both{true, false, true, false, false};
+        QTest::newRow("import") << 6 << user << QStringList{u"Old"_s, u"Ann"_s, u"Bo"_s, u"Cy"_s};
+        QTest::newRow("clear") << 4 << user << QStringList{};
+        QTest::newRow("delete") << 4 << both << QStringList{};
+    }
+
+    void aFailingWriteLosesNothing()
+    {
+        QFETCH(int, button);
+        QFETCH(ListChoice, choice);
+        QFETCH(QStringList, after);
+        FaultyDisk::install();
+        const QString table = choice.user ? u"user_firstname"_s : u"system_ffirstname"_s;
+        const QString male = u"system_mfirstname"_s;
+        QTemporaryDir folder;
+        const QString original = folder.filePath(u"names.mdb"_s);
+        createEmptyDatabase(original);
+        insertRows(original, table, choice.user ? u"firstname"_s : u"Ffirst"_s, {u"Old"_s});
+        insertRows(original, male, u"Mfirst"_s, {u"Old"_s});
+        const QStringList before = tableColumn(original, table, u"*"_s);
+        int write = 1;
+        for (;; ++write) {
+            QVERIFY(write < 500);
+            Rig rig(original);
+            rig.choice = choice;
+            rig.lists.RefreshLists(choice);
+            const QString file = rig.env.filePath(u"names.txt"_s);
+            writeBytes(file, "Ann\nBo\nCy\n");
+            rig.env.dialogs.answerOpen({file});
+
+            FaultyDisk::failed = false;
+            FaultyDisk::writesToFail = write;
+            button == 6 ? rig.editor.PushButton6_Click() : rig.editor.PushButton4_Click(0);
+            FaultyDisk::writesToFail = 0;
+
+            const QStringList messages = rig.env.dialogs.messages();
+            const QStringList names = tableColumn(rig.db, table, u"*"_s);
+            QCOMPARE(tableColumn(rig.db, u"pragma_integrity_check"_s, u"*"_s),
+                     QStringList{u"ok"_s});
+            if (!FaultyDisk::failed) {
+                QVERIFY2(messages.isEmpty(), qPrintable(messages.join(u'\n')));
+                QCOMPARE(names, after);
+                break;
+            }
+            QCOMPARE(messages.size(), 1);
+            QVERIFY2(messages[0].startsWith(rig.db + u": disk I/O error"_s),
+                     qPrintable(messages[0]));
+            QCOMPARE(names.mid(0, before.size()), before);
+            // A first part of the file's names at most.
+            QVERIFY(names == before || after.mid(0, names.size()) == names);
+            QCOMPARE(tableColumn(rig.db, male, u"*"_s), QStringList{u"Old"_s});
+        }
+        QVERIFY(write > 3); // there were writes to fail
+    }
+
+    // A full disk or a read-only database, on a small file system of the
+    // test's own where the tests run as root (else under a limit on the size
+    // of the files this process writes, or with the write permission taken
+    // away): the import ends with one report that names the database and
+    // says what failed, and nothing of the file is stored.
+    void aFaultOfTheDiskEndsTheImport_data()
+    {
+        QTest::addColumn<QString>("error");
+        QTest::newRow("full") << u"database or disk is full"_s;
+        QTest::newRow("read-only") << u"attempt to write a readonly database"_s;
+    }
+
+    void aFaultOfTheDiskEndsTheImport()
+    {
+        QFETCH(QString, error);
+        const bool full = error == u"database or disk is full";
+        TestEnvironment env(false);
+        const QString disk = env.filePath(u"disk"_s);
+        QVERIFY(QDir().mkpath(disk));
+        struct Mount {
+            QString folder;
+            bool mounted = geteuid() == 0
+                           && QProcess::execute(u"mount"_s, {u"-t"_s, u"tmpfs"_s, u"-o"_s,
+                                                             u"size=256k"_s, u"tmpfs"_s, folder})
+                                  == 0;
+            ~Mount()
+            {
+                if (mounted)
+                    QProcess::execute(u"umount"_s, {folder});
+            }
+        } mount{disk};
+        const QString db = disk + u"/names.mdb"_s;
+        createEmptyDatabase(db);
+        QByteArray names;
+        for (int i = 0; i < 40000; ++i)
+            names += "Quillon" + QByteArray::number(i) + '\n';
+        writeBytes(env.filePath(u"names.txt"_s), names);
+        FakePointer pointer;
+        NameLists lists(db);
+        ListEditor editor(env.dialogs, db, lists, pointer, [] {
+            return ListChoice{false, true, true, false, false};
+        });
+        env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
+
+        rlimit limit{};
+        getrlimit(RLIMIT_FSIZE, &limit);
+        const rlimit unlimited = limit;
+        if (!full && mount.mounted) {
+            QCOMPARE(QProcess::execute(u"mount"_s, {u"-o"_s, u"remount,ro"_s, disk}), 0);
+        } else if (!full) {
+            QVERIFY(QFile::setPermissions(db, QFile::ReadOwner));
+            QVERIFY(QFile::setPermissions(disk, QFile::ReadOwner | QFile::ExeOwner));
+        } else if (!mount.mounted) {
+            std::signal(SIGXFSZ, SIG_IGN);
+            limit.rlim_cur = QFileInfo(db).size() + 64 * 1024;
+            QCOMPARE(setrlimit(RLIMIT_FSIZE, &limit), 0);
+            error.clear(); // the system says "file too large" or the disk is full
+        }
+        editor.PushButton6_Click();
+        setrlimit(RLIMIT_FSIZE, &unlimited);
+        QFile::setPermissions(disk, QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
+
+        const QStringList messages = env.dialogs.messages();
+        QCOMPARE(messages.size(), 1);
+        QVERIFY2(messages[0].startsWith(db + u": "_s + error), qPrintable(messages[0]));
+        QVERIFY(tableColumn(db, u"user_firstname"_s, u"*"_s).isEmpty());
+        QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
     }
 };
 

@@ -12,11 +12,11 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-const ListChoice Both{true, false, true, false, false}, MaleOnly{true, false, false, true, false};
-const ListChoice User{false, true, true, false, false};
-const QStringList Tables{u"system_mfirstname"_s, u"system_ffirstname"_s, u"system_lastname"_s,
-                         u"user_firstname"_s, u"user_lastname"_s};
-const QStringList Columns{u"Mfirst"_s, u"Ffirst"_s, u"Last"_s, u"firstname"_s, u"lastname"_s};
+const ListChoice Both{.builtIn = true, .user = false, .both = true, .male = false, .female = false};
+const ListChoice MaleOnly{
+    .builtIn = true, .user = false, .both = false, .male = true, .female = false};
+const ListChoice User{.builtIn = false, .user = true, .both = true, .male = false, .female = false};
+const QStringList &Tables = DatabaseTables, &Columns = DatabaseColumns;
 
 QMap<QString, QStringList> snapshot(const QString& db)
 {
@@ -52,23 +52,56 @@ private Q_SLOTS:
         const QString m = u"system_mfirstname"_s, f = u"system_ffirstname"_s, nq = u"Quillonne"_s;
         const QString uf = u"user_firstname"_s, ul = u"user_lastname"_s, l = u"system_lastname"_s;
         const QString lee = u" Ann Lee "_s, on = u"o'Ne'il"_s;
-        constexpr ClosingLine Long = ClosingLine::Long, Short = ClosingLine::Short;
-        QTest::newRow("add: cancel") << Click{User, 2};
-        QTest::newRow("add: empty") << Click{User, 2, u""_s};
-        QTest::newRow("add: spaces only") << Click{User, 5, u"   "_s};
-        QTest::newRow("add: apostrophes only") << Click{User, 2, u"'''"_s};
-        QTest::newRow("add: spaces kept") << Click{User, 2, lee, {uf}, lee, true};
-        QTest::newRow("add: apostrophes out") << Click{User, 5, on, {ul}, u"oNeil"_s, true};
-        QTest::newRow("add: built-in, Male Only") << Click{MaleOnly, 2, nq, {f}, nq, false};
-        QTest::newRow("add: built-in last name") << Click{MaleOnly, 5, nq, {l}, nq, true};
-        QTest::newRow("delete: Both, an apostrophe") << Click{Both, 4, u"O'Quill"_s, {m, f}};
-        QTest::newRow("none selected") << Click{Both, 4, {}, {}, {}, false, {20, 30}, Short};
-        QTest::newRow("none selected, last") << Click{Both, 3, {}, {}, {}, false, {40}};
-        QTest::newRow("clear first names, none selected") << Click{User, 4, {}, {uf}};
-        QTest::newRow("PushButton2") << Click{Both, 2, {}, {}, {}, false, {10, 50}, Long, true};
-        QTest::newRow("PushButton5") << Click{Both, 5, {}, {}, {}, false, {10, 50}, Long, true};
+        constexpr ClosingLine Short = ClosingLine::Short;
+        QTest::newRow("add: cancel") << Click{.choice = User, .button = 2};
+        QTest::newRow("add: empty") << Click{.choice = User, .button = 2, .input = u""_s};
+        QTest::newRow("add: spaces only") << Click{.choice = User, .button = 5, .input = u"   "_s};
+        QTest::newRow("add: apostrophes only")
+            << Click{.choice = User, .button = 2, .input = u"'''"_s};
+        // Only spaces make a reply blank; a control character is refused.
+        QTest::newRow("add: a no-break space") << Click{.choice = User,
+                                                        .button = 5,
+                                                        .input = u"\u00A0"_s,
+                                                        .tables = {ul},
+                                                        .stored = u"\u00A0"_s,
+                                                        .shown = true};
+        QTest::newRow("add: a tab")
+            << Click{.choice = User, .button = 2, .input = u"\t"_s, .reports = {30}};
+        QTest::newRow("add: a line break")
+            << Click{.choice = User, .button = 5, .input = u"Ann\nLee"_s, .reports = {30}};
+        QTest::newRow("add: spaces kept") << Click{.choice = User,
+                                                   .button = 2,
+                                                   .input = lee,
+                                                   .tables = {uf},
+                                                   .stored = lee,
+                                                   .shown = true};
+        QTest::newRow("add: apostrophes out") << Click{.choice = User,
+                                                       .button = 5,
+                                                       .input = on,
+                                                       .tables = {ul},
+                                                       .stored = u"oNeil"_s,
+                                                       .shown = true};
+        QTest::newRow("add: built-in, Male Only")
+            << Click{.choice = MaleOnly, .button = 2, .input = nq, .tables = {f}, .stored = nq};
+        QTest::newRow("add: built-in last name") << Click{.choice = MaleOnly,
+                                                          .button = 5,
+                                                          .input = nq,
+                                                          .tables = {l},
+                                                          .stored = nq,
+                                                          .shown = true};
+        QTest::newRow("delete: Both, an apostrophe")
+            << Click{.choice = Both, .button = 4, .input = u"O'Quill"_s, .tables = {m, f}};
+        QTest::newRow("none selected")
+            << Click{.choice = Both, .button = 4, .reports = {20, 30}, .closing = Short};
+        QTest::newRow("none selected, last") << Click{.choice = Both, .button = 3, .reports = {40}};
+        QTest::newRow("clear first names, none selected")
+            << Click{.choice = User, .button = 4, .tables = {uf}};
+        QTest::newRow("PushButton2")
+            << Click{.choice = Both, .button = 2, .reports = {10, 50}, .noDatabase = true};
+        QTest::newRow("PushButton5")
+            << Click{.choice = Both, .button = 5, .reports = {10, 50}, .noDatabase = true};
         // An empty pane's button does no database work: the missing file goes unnoticed.
-        QTest::newRow("empty pane") << Click{User, 3, {}, {}, {}, false, {}, Long, true};
+        QTest::newRow("empty pane") << Click{.choice = User, .button = 3, .noDatabase = true};
     }
 
     void clicking()
@@ -81,7 +114,7 @@ private Q_SLOTS:
         // A name in every table twice, as an older database may hold it: a delete takes both.
         for (qsizetype t = 0; t < Tables.size() && !c.noDatabase; ++t)
             insertRows(db, Tables[t], Columns[t], {u"O'Quill"_s, u"O'Quill"_s});
-        NameLists lists(db, pointer);
+        NameLists lists(db);
         lists.RefreshLists(c.choice);
         pointer.history.clear();
         ListEditor editor(env.dialogs, db, lists, pointer, [&] { return c.choice; });

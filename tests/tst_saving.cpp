@@ -1,10 +1,13 @@
 // Saving the results list: the text file's bytes and its safe replacement,
 // the workbook as an independent reader sees it, and the reports a user gets
 // when something fails.
+#include "app/resultssaver.h"
 #include "base/errorreport.h"
+#include "base/failure.h"
+#include "base/safefile.h"
 #include "results/resultrows.h"
 #include "results/resultsmodel.h"
-#include "app/resultssaver.h"
+#include "results/spreadsheet.h"
 #include "results/textfile.h"
 #include "support/fakedialogs.h"
 #include "support/fakeplatform.h"
@@ -12,12 +15,27 @@
 
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
 #include <QProcess>
 #include <QTemporaryDir>
+#include <QTemporaryFile>
 #include <QTest>
 
 #include <csignal>
+#include <cstdio>
+#include <ctime>
+#include <functional>
+#include <thread>
+
+#include <fcntl.h>
+#include <grp.h>
+#include <pwd.h>
+#include <sys/mount.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
+#include <sys/sysmacros.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 using namespace Qt::StringLiterals;
 
@@ -60,6 +78,107 @@ void verifyOneReport(const FakeDialogs& dialogs, int line, const QString& start)
     QVERIFY2(description.startsWith(start), qPrintable(report.text));
     QCOMPARE(report.text, errorReportText(description, u"in Tessmark.Form2.PushButton2_Click "_s,
                                           line, ClosingLine::Long));
+}
+
+// What a save is pointed at, in a folder that holds "out" (mode 640) and
+// the names database.
+enum class Target {
+    Regular,
+    NewName,
+    Link,             // "link" -> out
+    PlantedLink,      // the same, made by another user in a shared folder
+    ReadOnly,         // out, mode 444, saved by an unprivileged user
+    Fifo,             // a reader takes what is written
+    FifoReaderGone,   // the reader leaves before the end
+    NullDevice,       // a character device like /dev/null
+    FullDevice,       // like /dev/full
+    FileSizeLimit,    // the process may write no more than 4 KB to a file
+    DiskFull,         // the folder is a small file system of its own
+    Stale,            // temporary files of other processes beside out
+    DatabaseRelative, // names.mdb, from the folder itself
+    DatabaseLink,     // "link.txt" -> names.mdb
+};
+
+const QString NamesDatabase = u"it is the names database, whose lists the results would replace"_s;
+
+// Saves rows to path as a text file through the results window, or as a
+// workbook as quillane-cli saves one; the failure's text, empty for none.
+QString saveAs(bool workbook, const QString& path, const QString& database, const ResultRows& rows)
+{
+    if (workbook) {
+        try {
+            saveWorkbook(rows, OutputChoice::SpreadsheetTwoCells, path, database);
+            return {};
+        } catch (const Failure& failure) {
+            return failure.description();
+        }
+    }
+    FakeDialogs dialogs;
+    FakeShell shell;
+    dialogs.answerSave(path);
+    ResultsSaver(dialogs, shell, QDir::tempPath(), database).save(OutputChoice::TextFile, rows);
+    if (dialogs.messages().isEmpty())
+        return {};
+    const QString report = dialogs.messages().constLast();
+    const QString description = report.section(u"\r\n"_s, 0, 0);
+    return report
+                   == errorReportText(description, u"in Tessmark.Form2.PushButton2_Click "_s, 30,
+                                      ClosingLine::Long)
+               ? description
+               : u"not the report of step 30: "_s + report;
+}
+
+// Runs work in a child process as the unprivileged user "nobody" and
+// returns what it returns.
+QString asNobody(const std::function<QString()>& work)
+{
+    const passwd* nobody = ::getpwnam("nobody");
+    int channel[2];
+    if (!nobody || ::pipe(channel) != 0)
+        return u"no user nobody"_s;
+    const pid_t child = ::fork();
+    if (child == 0) {
+        ::close(channel[0]);
+        if (::setgroups(0, nullptr) != 0 || ::setgid(nobody->pw_gid) != 0
+            || ::setuid(nobody->pw_uid) != 0)
+            ::_exit(2);
+        const QByteArray answer = work().toUtf8();
+        const bool sent =
+            ::write(channel[1], answer.constData(), std::size_t(answer.size())) == answer.size();
+        ::_exit(sent ? 0 : 1);
+    }
+    ::close(channel[1]);
+    QFile answer;
+    QByteArray bytes;
+    if (answer.open(channel[0], QIODevice::ReadOnly, QFileDevice::AutoCloseHandle))
+        bytes = answer.readAll();
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    return WIFEXITED(status) && WEXITSTATUS(status) == 0 ? QString::fromUtf8(bytes)
+                                                         : u"the child failed"_s;
+}
+
+// A process id that no process has (any more).
+pid_t deadProcess()
+{
+    const pid_t child = ::fork();
+    if (child == 0)
+        ::_exit(0);
+    ::waitpid(child, nullptr, 0);
+    return child;
+}
+
+mode_t modeOf(const QString& path)
+{
+    struct stat info {};
+    return ::lstat(QFile::encodeName(path).constData(), &info) == 0 ? info.st_mode : 0;
+}
+
+void writeFile(const QString& path, const QByteArray& bytes)
+{
+    QFile file(path);
+    if (file.open(QIODevice::WriteOnly))
+        file.write(bytes);
 }
 
 } // namespace
@@ -163,6 +282,272 @@ private Q_SLOTS:
         QCOMPARE(layout(ListRows(byName)), bytes);
     }
 
+    // A field is quoted, its quotes doubled, where a CSV reader would split
+    // it: at a comma, a quote, and either half of a line end. Rows kept as
+    // indices and rows kept by name alike.
+    void csvQuotesWhatWouldSplitAField_data()
+    {
+        QTest::addColumn<QString>("name");
+        QTest::addColumn<QByteArray>("field");
+        QTest::newRow("plain") << u"Ann"_s << QByteArray("Ann");
+        QTest::newRow("comma") << u"Ann,Bo"_s << QByteArray("\"Ann,Bo\"");
+        QTest::newRow("quote") << u"A\"nn"_s << QByteArray("\"A\"\"nn\"");
+        QTest::newRow("CR") << u"Ann\rBo"_s << QByteArray("\"Ann\rBo\"");
+        QTest::newRow("LF") << u"Ann\nBo"_s << QByteArray("\"Ann\nBo\"");
+        QTest::newRow("CR LF") << u"Ann\r\nBo"_s << QByteArray("\"Ann\r\nBo\"");
+    }
+
+    void csvQuotesWhatWouldSplitAField()
+    {
+        QFETCH(QString, name);
+        QFETCH(QByteArray, field);
+        GeneratedNames generated;
+        generated.firstNames = QStringList{name};
+        generated.lastNames = QStringList{name};
+        generated.rows = {{0, 0}};
+        ResultsModel indexed;
+        indexed.setRows(generated);
+        const QByteArray csv = "first_name,last_name\r\n" + field + ',' + field + "\r\n";
+        QCOMPARE(resultsCsv(indexed), csv);
+        QCOMPARE(resultsCsv(ListRows({{name, name}})), csv);
+    }
+
+    // Every file is written by one rule, the same for a text file and a
+    // workbook: what can be replaced is replaced whole or not at all, with
+    // its mode; a link's target is replaced; devices and FIFOs are written
+    // as they are; what the user may not write, and the names database
+    // however reached, are refused; failures give the system's text.
+    void everyFileByOneRule_data()
+    {
+        QTest::addColumn<bool>("workbook");
+        QTest::addColumn<Target>("target");
+        QTest::addColumn<QString>("error"); // after "could not be saved: "; empty for none
+        for (const bool workbook : {false, true}) {
+            const auto row = [workbook](const char* name, Target target, const QString& error) {
+                QTest::addRow("%s: %s", workbook ? "workbook" : "text", name)
+                    << workbook << target << error;
+            };
+            row("regular file", Target::Regular, {});
+            row("new name", Target::NewName, {});
+            row("link: its target", Target::Link, {});
+            row("link of another user in a shared folder", Target::PlantedLink,
+                u"Permission denied"_s);
+            row("read-only file", Target::ReadOnly, u"Permission denied"_s);
+            row("FIFO", Target::Fifo, {});
+            row("FIFO, reader gone", Target::FifoReaderGone, u"Broken pipe"_s);
+            row("character device", Target::NullDevice, {});
+            row("device full", Target::FullDevice, u"No space left on device"_s);
+            row("file size limit", Target::FileSizeLimit, u"File too large"_s);
+            row("disk full", Target::DiskFull, u"No space left on device"_s);
+            row("stale temporary files", Target::Stale, {});
+            row("database, relative", Target::DatabaseRelative, NamesDatabase);
+            row("database, link", Target::DatabaseLink, NamesDatabase);
+        }
+    }
+
+    void everyFileByOneRule()
+    {
+        QFETCH(bool, workbook);
+        QFETCH(Target, target);
+        QFETCH(QString, error);
+        const bool root = ::geteuid() == 0;
+        if ((target == Target::NullDevice || target == Target::FullDevice) && !root)
+            QSKIP("Only root makes device nodes.");
+        if (target == Target::PlantedLink && !root)
+            QSKIP("Only root gives a link to another user.");
+        if (target == Target::ReadOnly && !root)
+            QSKIP("Needs root to run a child as an unprivileged user (root writes any file).");
+
+        QTemporaryDir dir;
+        struct Unmount {
+            QByteArray at;
+            ~Unmount()
+            {
+                if (!at.isEmpty())
+                    ::umount2(at.constData(), MNT_DETACH);
+            }
+        } unmount;
+        if (target == Target::DiskFull) {
+            if (!root)
+                QSKIP("Only root mounts a small file system.");
+            const QByteArray at = QFile::encodeName(dir.path());
+            if (::mount("tmpfs", at.constData(), "tmpfs", 0, "size=256k") != 0)
+                QSKIP("No small file system can be mounted here.");
+            unmount.at = at;
+        }
+        // A workbook for a device or a FIFO is built in the temporary folder:
+        // the row's own here. A relative path starts in the row's folder.
+        struct Restore {
+            QString current = QDir::currentPath();
+            QByteArray temporary = qgetenv("TMPDIR");
+            ~Restore()
+            {
+                QDir::setCurrent(current);
+                qputenv("TMPDIR", temporary);
+            }
+        } restore;
+        QTemporaryFile errors;
+        QVERIFY(errors.open());
+        QVERIFY(QDir(dir.path()).mkdir(u"tmp"_s));
+        qputenv("TMPDIR", QFile::encodeName(dir.filePath(u"tmp"_s)));
+
+        // The independent reader takes a workbook by its extension only.
+        const QString extension = workbook ? u".xlsx"_s : u".txt"_s;
+        const QString out = dir.filePath(u"out"_s + extension),
+                      database = dir.filePath(u"names.mdb"_s);
+        writeFile(out, "old");
+        QFile::setPermissions(out, QFile::ReadOwner | QFile::WriteOwner | QFile::ReadGroup);
+        writeFile(database, "names");
+        const QByteArray folder = QFile::encodeName(dir.path());
+        const auto node = [&](const char* name) { return QByteArray(folder + '/' + name); };
+        const QString fresh = SafeFile::temporaryPrefix(::getppid()) + u"Fresh1.part"_s;
+        const QString dead = SafeFile::temporaryPrefix(deadProcess()) + u"Dead01.part"_s;
+        const QString old = SafeFile::temporaryPrefix(::getppid()) + u"Old001.part"_s;
+        const QString notOurs = u".quillane-notes.part"_s;
+
+        QString path = out;
+        std::thread reader;
+        QByteArray received;
+        switch (target) {
+        case Target::NewName:
+            path = dir.filePath(u"new"_s + extension);
+            break;
+        case Target::Link:
+        case Target::PlantedLink:
+        case Target::DatabaseLink:
+            QVERIFY(
+                ::symlink(QFile::encodeName(
+                              QFileInfo(target == Target::DatabaseLink ? database : out).fileName())
+                              .constData(),
+                          node("link").constData())
+                == 0);
+            path = dir.filePath(u"link"_s);
+            if (target == Target::PlantedLink) {
+                const passwd* nobody = ::getpwnam("nobody");
+                QVERIFY(nobody
+                        && ::lchown(node("link").constData(), nobody->pw_uid, gid_t(-1)) == 0);
+                QVERIFY(::chmod(folder.constData(), 01777) == 0);
+            }
+            break;
+        case Target::ReadOnly:
+            QFile::setPermissions(out, QFile::ReadOwner | QFile::ReadGroup | QFile::ReadOther);
+            // The folder lets anyone make a file: only the file's mode refuses.
+            QVERIFY(::chmod(folder.constData(), 0777) == 0);
+            break;
+        case Target::Fifo:
+        case Target::FifoReaderGone:
+            QVERIFY(::mkfifo(node("fifo").constData(), 0600) == 0);
+            path = dir.filePath(u"fifo"_s);
+            reader = std::thread([&, all = target == Target::Fifo] {
+                QFile fifo(path);
+                if (fifo.open(QIODevice::ReadOnly) && all)
+                    received = fifo.readAll();
+            });
+            break;
+        case Target::NullDevice:
+        case Target::FullDevice:
+            QVERIFY(::mknod(node("device").constData(), S_IFCHR | 0666,
+                            ::makedev(1, target == Target::NullDevice ? 3 : 7))
+                    == 0);
+            path = dir.filePath(u"device"_s);
+            break;
+        case Target::Stale:
+            for (const QString& name : {fresh, dead, old, notOurs})
+                writeFile(dir.filePath(name), "part");
+            {
+                const timespec twoDaysAgo{std::time(nullptr) - 2 * 24 * 3600, 0};
+                const timespec times[2] = {twoDaysAgo, twoDaysAgo};
+                QVERIFY(::utimensat(AT_FDCWD, QFile::encodeName(dir.filePath(old)).constData(),
+                                    times, 0)
+                        == 0);
+            }
+            break;
+        case Target::DatabaseRelative:
+            QVERIFY(QDir::setCurrent(dir.path()));
+            path = u"names.mdb"_s;
+            break;
+        default:
+            break;
+        }
+
+        // More than a pipe or the small disk holds, in a workbook too.
+        ListRows rows(AnnBob);
+        if (target == Target::FileSizeLimit || target == Target::DiskFull
+            || target == Target::FifoReaderGone) {
+            rows.names.clear();
+            for (int i = 0; i < 20000; ++i)
+                rows.names.append({u"First%1"_s.arg(i * 7919 % 20011), u"Last%1"_s.arg(i)});
+        }
+        const auto save = [&] { return saveAs(workbook, path, database, rows); };
+        // Nothing on standard error beside the one report: not the workbook
+        // writer's own lines either.
+        std::fflush(stderr);
+        const int standardError = ::dup(STDERR_FILENO);
+        ::dup2(errors.handle(), STDERR_FILENO);
+        QString failure;
+        if (target == Target::ReadOnly) {
+            failure = asNobody(save);
+        } else if (target == Target::FileSizeLimit) {
+            // The signal as a program gets it: it must not end the program.
+            const rlimit small{4096, RLIM_INFINITY}, unlimited{RLIM_INFINITY, RLIM_INFINITY};
+            std::signal(SIGXFSZ, SIG_DFL);
+            setrlimit(RLIMIT_FSIZE, &small);
+            failure = save();
+            setrlimit(RLIMIT_FSIZE, &unlimited);
+        } else {
+            std::signal(SIGPIPE, SIG_DFL);
+            failure = save();
+        }
+        std::fflush(stderr);
+        ::dup2(standardError, STDERR_FILENO);
+        ::close(standardError);
+        if (reader.joinable()) {
+            if (!failure.isEmpty()) // let a reader that got nothing go
+                ::close(::open(path.toLocal8Bit().constData(), O_WRONLY | O_NONBLOCK));
+            reader.join();
+        }
+        QCOMPARE(errors.readAll(), QByteArray());
+
+        if (error.isEmpty())
+            QCOMPARE(failure, QString());
+        else
+            QCOMPARE(failure, u"The file %1 could not be saved: %2"_s.arg(path, error));
+
+        const QByteArray text("Ann Lee\r\nBob Stone\r\n");
+        const QString cells = u"A1 Ann,B1 Lee,A2 Bob,B2 Stone"_s;
+        const auto holdsTheRows = [&](const QString& file) {
+            return workbook ? readWorkbook(file) == cells : readAll(file) == text;
+        };
+        const bool replaced =
+            error.isEmpty()
+            && (target == Target::Regular || target == Target::Link || target == Target::Stale);
+        QVERIFY(replaced ? holdsTheRows(out) : readAll(out) == "old");
+        QCOMPARE(modeOf(out) & 0777, target == Target::ReadOnly ? 0444u : 0640u);
+        QCOMPARE(readAll(database), QByteArray("names"));
+        if (target == Target::NewName) {
+            QVERIFY(holdsTheRows(path));
+            const mode_t mask = ::umask(0);
+            ::umask(mask);
+            QCOMPARE(modeOf(path) & 0777, 0666 & ~mask);
+        }
+        if (target == Target::Link || target == Target::PlantedLink
+            || target == Target::DatabaseLink)
+            QVERIFY(S_ISLNK(modeOf(path)));
+        if (target == Target::Fifo) {
+            QVERIFY(S_ISFIFO(modeOf(path)));
+            QVERIFY(workbook ? received.startsWith("PK\x03\x04") : received == text);
+        }
+        if (target == Target::NullDevice || target == Target::FullDevice)
+            QVERIFY(S_ISCHR(modeOf(path)));
+
+        // No temporary file is left, and of the others' only those whose
+        // process still runs and that are not old, and names not ours.
+        QStringList left = entries(dir.path()).filter(u".part"_s);
+        left.sort();
+        QCOMPARE(left, (target == Target::Stale ? QStringList{fresh, notOurs} : QStringList()));
+        QCOMPARE(entries(dir.filePath(u"tmp"_s)), QStringList());
+    }
+
     void workbook_data()
     {
         QTest::addColumn<OutputChoice>("choice");
@@ -179,6 +564,7 @@ private Q_SLOTS:
 
     void workbook()
     {
+        SKIP_WITHOUT_WORKBOOK_READER();
         QFETCH(OutputChoice, choice);
         QFETCH(Names, names);
         QTemporaryDir cache, noCache;

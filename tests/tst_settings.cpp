@@ -1,9 +1,17 @@
 // The settings store: the default rule, Booleans as the program reads them,
-// and writes that reach the file at once.
+// writes that reach the file at once, and stores that are malformed or
+// cannot be written.
 #include "base/settings.h"
 #include "support/testenvironment.h"
 
+#include <QProcess>
 #include <QTest>
+
+#include <cstdio>
+
+#include <grp.h>
+#include <pwd.h>
+#include <unistd.h>
 
 using namespace Qt::StringLiterals;
 
@@ -56,7 +64,144 @@ private Q_SLOTS:
                  stored.isNull() ? defaultValue : stored);
         QCOMPARE(settings.readBool(u"Option9"_s, defaultValue), asBoolean);
     }
+
+    void damagedOrUnwritableStore_data()
+    {
+        QTest::addColumn<QString>("kind"); // of Varnholt.ini: file, none, folder, link
+        QTest::addColumn<QByteArray>("content");
+        QTest::addColumn<int>("folderMode");
+        QTest::addColumn<int>("fileMode");
+        QTest::addColumn<QString>("reason"); // of the one report; empty: written
+        QTest::addColumn<QString>("before"); // what "Text1" read at start
+
+        const QByteArray good = "[Quillane]\nText1=250\n[Other]\nkept=1\n";
+        const QByteArray malformed =
+            "[Quillane]\nText1=250\n=no key\nno value\n\x01\x1b[2J\n[Other]\nkept=1\n";
+        const QString denied = u"Permission denied"_s;
+        QTest::newRow("writable") << u"file"_s << good << 0777 << 0666 << QString() << u"250"_s;
+        QTest::newRow("malformed lines")
+            << u"file"_s << malformed << 0777 << 0666 << QString() << u"250"_s;
+        QTest::newRow("read-only file") << u"file"_s << good << 0777 << 0444 << denied << u"250"_s;
+        QTest::newRow("malformed, read-only")
+            << u"file"_s << malformed << 0777 << 0444 << denied << u"250"_s;
+        QTest::newRow("read-only folder")
+            << u"none"_s << QByteArray() << 0555 << 0 << denied << u"100"_s;
+        QTest::newRow("read-only folder, writable file")
+            << u"file"_s << good << 0555 << 0666 << denied << u"250"_s;
+        QTest::newRow("a folder in its place")
+            << u"folder"_s << QByteArray() << 0777 << 0 << u"Is a directory"_s << u"100"_s;
+        QTest::newRow("dangling link")
+            << u"link"_s << QByteArray() << 0777 << 0 << u"No such file or directory"_s << u"100"_s;
+    }
+
+    // The store is used by an unprivileged child, since the tests may run
+    // as root, whom permission bits do not stop. A store that cannot be
+    // written is reported once, at the first write, and the values written
+    // hold in memory; the file is left as it was. A malformed file reads as
+    // the keys it holds, and the next write leaves a well-formed file that
+    // keeps every key it held.
+    void damagedOrUnwritableStore()
+    {
+        QFETCH(QString, kind);
+        QFETCH(QByteArray, content);
+        QFETCH(int, folderMode);
+        QFETCH(int, fileMode);
+        QFETCH(QString, reason);
+        QFETCH(QString, before);
+        QTemporaryDir folder;
+        const QString path = folder.filePath(u"Varnholt.ini"_s);
+        if (kind == u"file")
+            writeBytes(path, content);
+        else if (kind == u"folder")
+            QVERIFY(QDir(folder.path()).mkdir(u"Varnholt.ini"_s));
+        else if (kind == u"link")
+            QVERIFY(QFile::link(u"missing/Varnholt.ini"_s, path));
+        if (kind == u"file")
+            QVERIFY(QFile::setPermissions(path, QFile::Permissions(permissions(fileMode))));
+        QVERIFY(QFile::setPermissions(folder.path(), QFile::Permissions(permissions(folderMode))));
+
+        QProcess child;
+        child.start(QCoreApplication::applicationFilePath(),
+                    {u"--use-store-unprivileged"_s, folder.path()});
+        QVERIFY(child.waitForFinished(60000));
+        const QString output = QString::fromUtf8(child.readAllStandardOutput());
+        QFile::setPermissions(folder.path(),
+                              QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
+
+        const QString report = reason.isEmpty()
+                                   ? QString()
+                                   : u"Application Error: The settings file %1 cannot be written: "
+                                     "%2. Quillane goes on with your choices, but they will not be "
+                                     "there at its next start."_s.arg(path, reason);
+        QCOMPARE(output, u"%1 8 %2\n"_s.arg(before, report));
+        const QFileInfo after(path);
+        if (kind == u"file" && !reason.isEmpty())
+            QCOMPARE(fileBytes(path), content);
+        else if (kind == u"file" || kind == u"none")
+            QCOMPARE(after.exists(), reason.isEmpty());
+        if (kind == u"folder")
+            QVERIFY(after.isDir());
+        if (kind == u"link")
+            QVERIFY(after.isSymLink() && !after.exists());
+        if (reason.isEmpty()) {
+            const QByteArray written = fileBytes(path);
+            for (const char* line : {"Text1=8\n", "[Other]\nkept=1\n"})
+                QVERIFY2(written.contains(line), written.constData());
+        }
+    }
+
+private:
+    static QFileDevice::Permissions permissions(int mode)
+    {
+        // Owner, group and others alike: the child may be any of them.
+        QFileDevice::Permissions result;
+        const QFileDevice::Permission bits[] = {
+            QFile::ExeOther, QFile::WriteOther, QFile::ReadOther,
+            QFile::ExeGroup, QFile::WriteGroup, QFile::ReadGroup,
+            QFile::ExeOwner, QFile::WriteOwner, QFile::ReadOwner};
+        for (int bit = 0; bit < 9; ++bit)
+            if (mode & (1 << bit))
+                result |= bits[bit];
+        return result;
+    }
 };
 
-QTEST_GUILESS_MAIN(TestSettings)
+namespace {
+
+// The child of damagedOrUnwritableStore, as nobody when started as root:
+// reads "Text1", writes it twice and prints what it read at start, what it
+// reads at the end, and each report shown.
+int useStoreUnprivileged(const char* folder)
+{
+    if (::geteuid() == 0) {
+        const passwd* nobody = ::getpwnam("nobody");
+        if (!nobody || ::setgroups(0, nullptr) != 0 || ::setgid(nobody->pw_gid) != 0
+            || ::setuid(nobody->pw_uid) != 0)
+            return 3;
+    }
+    QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, QString::fromLocal8Bit(folder));
+    FakeDialogs dialogs;
+    Settings settings;
+    settings.reportWriteFailuresTo(&dialogs);
+    const QString before = settings.read(u"Text1"_s, u"100"_s);
+    settings.write(u"Text1"_s, u"7"_s);
+    settings.write(u"Text1"_s, u"8"_s);
+    QStringList reports;
+    for (const FakeDialogs::Shown& shown : dialogs.shown)
+        reports << shown.title + u": "_s + shown.text;
+    std::printf("%s %s %s\n", qUtf8Printable(before), qUtf8Printable(settings.read(u"Text1"_s, {})),
+                qUtf8Printable(reports.join(u'|')));
+    return 0;
+}
+
+} // namespace
+
+int main(int argc, char** argv)
+{
+    if (argc == 3 && qstrcmp(argv[1], "--use-store-unprivileged") == 0)
+        return useStoreUnprivileged(argv[2]);
+    QCoreApplication app(argc, argv);
+    TestSettings test;
+    return QTest::qExec(&test, argc, argv);
+}
 #include "tst_settings.moc"

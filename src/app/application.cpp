@@ -1,10 +1,10 @@
 #include "app/application.h"
 
-#include "base/dialogs.h"
 #include "app/environment.h"
-#include "base/failure.h"
 #include "app/form1.h"
 #include "app/programicon.h"
+#include "base/dialogs.h"
+#include "base/failure.h"
 
 #include <cstdio>
 #include <cstdlib>
@@ -20,7 +20,10 @@ QuillaneApplication::QuillaneApplication(int& argc, char** argv)
 {
     setOrganizationName(u"Varnholt"_s);
     setApplicationName(u"Quillane"_s);
-    setApplicationDisplayName(ApplicationTitle);
+    // No display name: the window system integration would append it to
+    // every title. The desktop file still ties the windows to the program's
+    // entry and icon.
+    setDesktopFileName(u"quillane"_s);
     setWindowIcon(programIcon());
 }
 
@@ -35,7 +38,7 @@ bool QuillaneApplication::notify(QObject* receiver, QEvent* event)
 
 void QuillaneApplication::endOnFailure()
 {
-    const QString description = describeCurrentException();
+    const QString description = escapeControlCharacters(describeCurrentException());
     std::fprintf(stderr, "quillane: %s\n", qUtf8Printable(description));
     if (m_dialogs) {
         m_dialogs->messageBox(u"Quillane cannot go on and will close.\n\n"_s + description,

@@ -1,5 +1,7 @@
 #pragma once
 
+#include "names/database.h"
+
 #include <QString>
 
 class Clock;
@@ -19,4 +21,12 @@ struct Environment {
     // The folder the executable was started from: it holds names.mdb and the
     // program's other files.
     QString programFolder;
+    // The names database the windows work on; empty for names.mdb in
+    // programFolder.
+    QString namesDatabase = {};
+
+    QString namesDatabaseFile() const
+    {
+        return namesDatabase.isEmpty() ? namesDatabasePath(programFolder) : namesDatabase;
+    }
 };

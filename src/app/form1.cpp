@@ -63,8 +63,8 @@ Form1::Form1(Environment& environment, QWidget* parent)
     , m_pointer(new WindowPointer(this))
     , m_sourceGroup(new QButtonGroup(this))
     , m_genderGroup(new QButtonGroup(this))
-    , m_lists(namesDatabasePath(environment.programFolder), *m_pointer)
-    , m_editor(environment.dialogs, namesDatabasePath(environment.programFolder), m_lists,
+    , m_lists(environment.namesDatabaseFile())
+    , m_editor(environment.dialogs, environment.namesDatabaseFile(), m_lists,
                *m_pointer, [this] { return listChoice(); })
 {
     buildLayout();
@@ -230,7 +230,7 @@ void Form1::Form_Load()
     ListView1->setColumnWidth(0, twipsToPixels(6500));
     ListView2->setColumnWidth(0, twipsToPixels(6500));
 
-    m_lists.RefreshLists(listChoice());
+    refreshLists(listChoice());
 
     const ListChoice stored = restoredListChoice(m_env.settings);
     restoreOption(Option9, stored.builtIn);
@@ -300,7 +300,7 @@ void Form1::Text1_GotFocus()
 void Form1::Option1_Click()
 {
     storeGenderOptions(m_env.settings, listChoice());
-    m_lists.RefreshLists(listChoice());
+    refreshLists(listChoice());
 }
 
 void Form1::Option2_Click()
@@ -332,6 +332,12 @@ void Form1::sourceOptionClick(bool gendersEnabled)
     storeSourceOptions(m_env.settings, choice);
     for (QRadioButton* gender : {Option1, Option2, Option3})
         gender->setEnabled(gendersEnabled);
+    refreshLists(choice);
+}
+
+void Form1::refreshLists(const ListChoice& choice)
+{
+    BusyPointer busy(*m_pointer);
     m_lists.RefreshLists(choice);
 }
 

@@ -8,7 +8,7 @@
 // work to a plain class that tests drive directly:
 //
 //   option clicks, Delete key, double-click --> NameLists (names/)   --> names.mdb
-//   add, delete/clear, load from file       --> ListEditor (names/)  --> names.mdb
+//   add, delete/clear, load from file       --> ListEditor --> list operations (names/) --> names.mdb
 //   "Start Generating"                        --> generation (generate/) --> Form2
 //   every button handler                      --> Trap --> error report on failure
 //
@@ -71,6 +71,8 @@ private:
     void Option8_Click();
     void Option9_Click();
     void sourceOptionClick(bool gendersEnabled);
+    // RefreshLists under the hourglass.
+    void refreshLists(const ListChoice& choice);
     void ListView_Remove(QTableView* pane, PaneModel& model);
     void PushButton1_Click();
     void PushButton2_Click();

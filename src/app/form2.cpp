@@ -1,11 +1,12 @@
 #include "app/form2.h"
 
 #include "app/layout.h"
-#include "base/trap.h"
+#include "app/resultssaver.h"
 #include "app/twips.h"
 #include "app/windowpointer.h"
 #include "app/windowroutines.h"
-#include "app/resultssaver.h"
+#include "base/trap.h"
+#include "names/database.h"
 
 #include <QApplication>
 #include <QCloseEvent>
@@ -118,5 +119,6 @@ void Form2::PushButton2_Click()
     const OutputChoice choice = Option5->isChecked()   ? OutputChoice::SpreadsheetTwoCells
                                 : Option6->isChecked() ? OutputChoice::SpreadsheetOneCell
                                                        : OutputChoice::TextFile;
-    ResultsSaver(m_env.dialogs, m_env.shell, QString()).save(choice, m_results);
+    ResultsSaver(m_env.dialogs, m_env.shell, QString(), namesDatabasePath(m_env.programFolder))
+        .save(choice, m_results);
 }

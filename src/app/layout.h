@@ -1,8 +1,9 @@
 #pragma once
 
 // Building blocks of the windows' fixed layouts: every control carries its
-// designer name as object name, its place in pixels, and a name that a
-// screen reader speaks.
+// designer name as object name and its place in pixels. A screen reader
+// speaks a button's caption as it stands: Qt takes the spoken name from it,
+// so it follows every change of the caption.
 
 #include "app/twips.h"
 
@@ -41,7 +42,6 @@ inline QPushButton* pushButton(QWidget* container, const QString& name, const QS
 {
     auto* button = place<QPushButton>(container, name, geometry);
     button->setText(caption);
-    button->setAccessibleName(caption);
     button->setFont(arialBold(11.25));
     return button;
 }
@@ -51,6 +51,8 @@ inline QGroupBox* frame(QWidget* container, const QString& name, const QString& 
 {
     auto* frame = place<QGroupBox>(container, name, geometry);
     frame->setTitle(caption);
+    // Set once, as a title never changes: without it Qt would speak the
+    // enclosing frame's title for a nested frame.
     frame->setAccessibleName(caption);
     paintWhite(frame);
     return frame;
@@ -61,7 +63,6 @@ inline QRadioButton* optionButton(QWidget* container, const QString& name, const
 {
     auto* option = place<QRadioButton>(container, name, geometry);
     option->setText(caption);
-    option->setAccessibleName(caption);
     paintWhite(option);
     return option;
 }

@@ -6,6 +6,7 @@
 #include "base/programfiles.h"
 #include "base/trap.h"
 #include "names/database.h"
+#include "names/listoperations.h"
 #include "names/namelists.h"
 
 #include <optional>
@@ -32,6 +33,31 @@ int deleteLine(const char* sql)
     if (sql == Sql::DeleteBuiltInFemaleFirstName)
         return 30;
     return 40;
+}
+
+// The step of FileToListview that reports a problem of the import.
+int importLine(ImportStep step)
+{
+    switch (step) {
+    case ImportStep::FindFile:
+    case ImportStep::OpenDatabase:
+        return 10;
+    case ImportStep::OpenFile:
+        return 20;
+    case ImportStep::Begin:
+        return 30;
+    case ImportStep::Read:
+        return 40;
+    case ImportStep::Store:
+        return 50;
+    case ImportStep::MoreRefused:
+        return 60;
+    case ImportStep::RebuildIndexes:
+        return 70;
+    case ImportStep::Commit:
+        return 80;
+    }
+    return 0;
 }
 
 } // namespace
@@ -90,12 +116,11 @@ void ListEditor::addName(ListKind kind, const QString& location, const QString& 
     QString reply;
     trap(20, [&] { reply = m_dialogs.inputBox(prompt, ApplicationTitle); });
     trap(30, [&] {
-        const QString name = nameToStore(reply, choice);
-        if (!name.isEmpty())
-            opened(connection).execute(insertStatement(kind, choice), name);
+        addNames([&]() -> Connection& { return opened(connection); }, kind, choice, {reply},
+                 BlankNames::Skip);
     });
     trap(40, [&] { connection.reset(); });
-    trap(50, [&] { m_lists.RefreshLists(choice); });
+    trap(50, [&] { refreshLists(choice); });
 }
 
 void ListEditor::deleteNames(ListKind kind, int selectedRow, const QString& location,
@@ -108,25 +133,22 @@ void ListEditor::deleteNames(ListKind kind, int selectedRow, const QString& loca
     const ListChoice choice = m_choice();
     std::optional<Connection> connection;
     trap(10, [&] { connection.emplace(m_databasePath); });
-
-    const auto selectedName = [&] {
-        if (selectedRow < 0 || selectedRow >= pane.count())
-            throw Failure(u"No name is selected in the list."_s);
-        return pane.names().at(selectedRow);
-    };
-    const auto deleteSelected = [&](const char* sql) {
-        const QString name = selectedName();
-        opened(connection).execute(sql, name);
-    };
     if (choice.builtIn) {
-        for (const char* sql : builtInDeletes(kind, choice))
-            trap(deleteLine(sql), [&] { deleteSelected(sql); });
+        // Null when nothing is selected: each delete that would have run fails.
+        const QString name = selectedRow >= 0 && selectedRow < pane.count()
+                                 ? pane.names().at(selectedRow)
+                                 : QString();
+        ::deleteNames([&]() -> Connection& { return opened(connection); }, kind, choice, {name},
+                      AbsentNames::Ignore,
+                      [&](const char* sql, const std::function<void()>& work) {
+                          return trap(deleteLine(sql), work);
+                      });
     } else if (choice.user) {
         // "Clear": the whole list goes, whatever is selected.
-        trap(50, [&] { opened(connection).execute(clearStatement(kind)); });
+        trap(50, [&] { clearList(opened(connection), kind); });
     }
     trap(60, [&] { connection.reset(); });
-    trap(70, [&] { m_lists.RefreshLists(choice); });
+    trap(70, [&] { refreshLists(choice); });
 }
 
 void ListEditor::importFiles(ListKind kind, const QString& location)
@@ -144,64 +166,27 @@ void ListEditor::importFiles(ListKind kind, const QString& location)
                 FileToListview(path, kind);
         });
     }
-    trap(30, [&] { m_lists.RefreshLists(m_choice()); });
+    trap(30, [&] { refreshLists(m_choice()); });
 }
 
 void ListEditor::FileToListview(const QString& path, ListKind kind)
 {
     Trap trap(m_dialogs, u"in Tessmark.Main.FileToListview "_s, ClosingLine::Long);
-    if (!FileExists(path)) {
-        refuse(m_dialogs, u"File not found"_s);
-        return;
-    }
-    const char* sql = insertStatement(kind, m_choice());
-
-    // Without the database, the file or a transaction there is nothing this
-    // file can give, so its import ends with the one report.
+    // A connection of its own for each file.
     std::optional<Connection> connection;
-    if (!trap(10, [&] { connection.emplace(m_databasePath); }))
-        return;
-    std::optional<NameFileImport> import;
-    if (!trap(20, [&] {
-            import.emplace(*connection, path, sql);
-            import->openFile();
-        }))
-        return;
-    if (!sql)
-        return;
-    // One commit for the whole file: a statement that fails changes nothing
-    // and the names before it stay, and a million names take seconds.
-    if (!trap(30, [&] { import->begin(); }))
-        return;
+    importNameFile([&]() -> Connection& { return connection.emplace(m_databasePath); }, path, kind,
+                   m_choice(),
+                   [&](const ImportProblem& problem) {
+                       if (problem.step == ImportStep::FindFile) {
+                           refuse(m_dialogs, problem.description);
+                           return;
+                       }
+                       trap(importLine(problem.step), [&] { throw Failure(problem.description); });
+                   });
+}
 
-    std::vector<NameSplitter::Name> names;
-    int rejected = 0;
-    bool reading = true;
-    while (reading) {
-        names.clear();
-        reading = false;
-        trap(40, [&] { reading = import->readNames(names); });
-        for (const NameSplitter::Name& name : names) {
-            const auto store = [&] { import->store(name); };
-            if (rejected < MaxReportsPerFile) {
-                if (!trap(50, store))
-                    ++rejected;
-                continue;
-            }
-            // Past the bound the names are still tried, and the rest counted.
-            try {
-                store();
-            } catch (...) {
-                ++rejected;
-            }
-        }
-    }
-    trap(60, [&] {
-        if (rejected > MaxReportsPerFile)
-            throw Failure(moreRejected(rejected - MaxReportsPerFile));
-    });
-    // Should an index fail to build, the names are kept all the same: the
-    // panes are then slower to fill, never wrong.
-    trap(70, [&] { import->rebuildIndexes(); });
-    trap(80, [&] { import->commit(); });
+void ListEditor::refreshLists(const ListChoice& choice)
+{
+    BusyPointer busy(m_window);
+    m_lists.RefreshLists(choice);
 }

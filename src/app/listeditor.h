@@ -12,9 +12,10 @@ class Dialogs;
 class NameLists;
 class PointerOwner;
 
-// The work of the main window's add, delete and import buttons. Each
-// handler runs under its error trap, changes only the names database, and
-// ends by rebuilding both panes from it.
+// The main window's add, delete and import buttons. Each handler runs the
+// list operation (names/listoperations.h) under its error trap, as numbered
+// steps, and ends by rebuilding both panes from the database under the
+// hourglass.
 //
 // The source and gender are read from the window at the moment of the
 // click, through the callback.
@@ -48,6 +49,7 @@ private:
     void addName(ListKind kind, const QString& location, const QString& prompt);
     void deleteNames(ListKind kind, int selectedRow, const QString& location, ClosingLine closing);
     void importFiles(ListKind kind, const QString& location);
+    void refreshLists(const ListChoice& choice);
 
     Dialogs& m_dialogs;
     QString m_databasePath;

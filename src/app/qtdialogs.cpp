@@ -1,5 +1,7 @@
 #include "app/qtdialogs.h"
 
+#include "base/failure.h"
+
 #include <QApplication>
 #include <QFileDialog>
 #include <QInputDialog>
@@ -15,11 +17,12 @@ QWidget* dialogParent()
 }
 
 // Message texts break lines with CR, LF or CR LF; a label breaks at LF only.
+// Any other control character a message quotes from a file is shown escaped.
 QString withLineFeeds(QString text)
 {
     text.replace(u"\r\n"_s, u"\n"_s);
     text.replace(u'\r', u'\n');
-    return text;
+    return escapeControlCharacters(text);
 }
 
 } // namespace

@@ -19,10 +19,12 @@ const QString Location = u"in Tessmark.Form2.PushButton2_Click "_s;
 const QString ResultsSaver::SaveDialogTitle = u"Save File As"_s;
 const QString ResultsSaver::SaveDialogFilter = u"Text Files (*.txt);;All Files (*)"_s;
 
-ResultsSaver::ResultsSaver(Dialogs& dialogs, Shell& shell, QString cacheFolder)
+ResultsSaver::ResultsSaver(Dialogs& dialogs, Shell& shell, QString cacheFolder,
+                           QString namesDatabase)
     : m_dialogs(dialogs)
     , m_shell(shell)
     , m_cacheFolder(std::move(cacheFolder))
+    , m_namesDatabase(std::move(namesDatabase))
 {
     if (m_cacheFolder.isEmpty()) {
         m_cacheFolder =
@@ -52,7 +54,7 @@ void ResultsSaver::saveTextFile(const ResultRows& rows)
     QByteArray text;
     if (!trap(20, [&] { text = resultsText(rows); }))
         return;
-    trap(30, [&] { WriteTextFile(text, path); });
+    trap(30, [&] { WriteTextFile(text, path, m_namesDatabase); });
 }
 
 void ResultsSaver::saveSpreadsheet(OutputChoice choice, const ResultRows& rows)

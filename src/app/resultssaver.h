@@ -14,8 +14,9 @@ class Shell;
 class ResultsSaver {
 public:
     // cacheFolder: where workbooks are put for the spreadsheet program;
-    // empty means the user's cache folder for this program.
-    ResultsSaver(Dialogs& dialogs, Shell& shell, QString cacheFolder);
+    // empty means the user's cache folder for this program. namesDatabase:
+    // the file that no save may replace (empty for none).
+    ResultsSaver(Dialogs& dialogs, Shell& shell, QString cacheFolder, QString namesDatabase = {});
 
     // The whole work of the button, under its error trap: every failure is
     // reported once, and the steps that need what failed are not tried.
@@ -32,4 +33,5 @@ private:
     Dialogs& m_dialogs;
     Shell& m_shell;
     QString m_cacheFolder;
+    QString m_namesDatabase;
 };

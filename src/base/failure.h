@@ -20,6 +20,12 @@ private:
     QByteArray m_utf8;
 };
 
+// The text with every control character but the line feed shown as an
+// escape (\t, \r, \x1b, \u009b ...), for every message that may carry
+// what a file or a command line held: a terminal or a dialog then shows
+// the characters instead of obeying them.
+QString escapeControlCharacters(const QString& text);
+
 // The description of whatever is being thrown right now; call it only from a
 // catch block. Failures give their own text, other exceptions a plain one.
 QString describeCurrentException();

@@ -10,7 +10,7 @@ class Dialogs;
 // steps; a step that fails is reported with the handler's location text and
 // the step's number, and the handler goes on with its next step:
 //
-//     Trap trap(dialogs, u"in Tessmark.Form1.PushButton2_Click "_s, ClosingLine::Long);
+//     Trap trap(dialogs, location, ClosingLine::Long);
 //     trap(10, [&] { ... });
 //     trap(20, [&] { ... });
 //

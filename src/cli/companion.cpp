@@ -2,16 +2,16 @@
 
 #include "base/clock.h"
 #include "base/failure.h"
-#include "base/pointer.h"
 #include "base/programfiles.h"
 #include "base/safefile.h"
 #include "generate/generation.h"
 #include "generate/namerun.h"
 #include "generate/randomsource.h"
 #include "names/database.h"
-#include "names/liststore.h"
+#include "names/listoperations.h"
 #include "names/namelists.h"
 #include "results/namestream.h"
+#include "results/resultsfile.h"
 #include "results/resultsmodel.h"
 #include "results/spreadsheet.h"
 #include "results/textfile.h"
@@ -51,13 +51,6 @@ struct UsageProblem {
     throw UsageProblem{message, command};
 }
 
-// A failure whose text says all there is to say: it names its own file, or
-// is about the command's input rather than the database it runs against.
-class Refusal : public Failure {
-public:
-    using Failure::Failure;
-};
-
 const char GeneralHelp[] = R"(Usage: quillane-cli [--database FILE] COMMAND [OPTIONS]
 
 Random personal names from Quillane's names database, for scripts, builds
@@ -72,9 +65,12 @@ Commands:
   import     add the names of text files, one per line, to a list
 
 Options:
-  --database FILE  the names database (default: names.mdb beside the program)
+  --database FILE  the names database (default: names.mdb beside the
+                   program, or your own copy of it in
+                   $XDG_DATA_HOME/quillane, ~/.local/share/quillane, where
+                   the program's folder cannot be written)
   -h, --help       show this help
-  --version        show the version
+  --version        show the version and the names database in use
 
 Run 'quillane-cli COMMAND --help' for the options of a command.
 )";
@@ -168,9 +164,10 @@ Options:
 
 Adds the names of text files to a list as the window's "Load ... From File"
 buttons do: one name per line, in UTF-8 (or UTF-16 or UTF-32 with a
-byte-order mark), apostrophes removed, empty lines skipped. A name longer
-than 255 characters is refused; then, or on any other failure, nothing of
-any file is imported.
+byte-order mark; a file that is not UTF-8 is read as Windows-1252),
+apostrophes removed, empty lines skipped. A name longer than 255 characters
+or with a control character is refused, and so is a file that is not text;
+then, or on any other failure, nothing of any file is imported.
 
 Options:
   --list builtin|user  the built-in list (default) or your own
@@ -220,19 +217,16 @@ struct GenerateRequest {
     QString output;  // empty: standard output
 };
 
-// Long operations show no pointer here.
-class NoPointer : public PointerOwner {
-public:
-    int mousePointer() const override { return MousePointer::Default; }
-    void setMousePointer(int) override {}
-};
-
 class Command {
 public:
-    Command(QString name, const QStringList& arguments, QString database, std::FILE* out)
+    // An empty database means the program's default, chosen only once the
+    // command line asks for a command to run.
+    Command(QString name, const QStringList& arguments, QString database, QString programFolder,
+            std::FILE* out)
         : m_name(std::move(name))
         , m_arguments(arguments)
         , m_database(std::move(database))
+        , m_programFolder(std::move(programFolder))
         , m_out(out)
     {
     }
@@ -277,6 +271,8 @@ private:
         if (mostPositional >= 0 && count > mostPositional)
             usage(u"Unexpected argument '%1'."_s.arg(m_parser.positionalArguments().at(count - 1)),
                   m_name);
+        if (m_database.isEmpty())
+            m_database = namesDatabaseInUse(m_programFolder);
         return true;
     }
 
@@ -320,41 +316,18 @@ private:
     static QCommandLineOption listOption() { return {u"list"_s, {}, u"LIST"_s, u"builtin"_s}; }
     static QCommandLineOption genderOption() { return {u"gender"_s, {}, u"GENDER"_s, u"both"_s}; }
 
-    // Runs work against the names database; its failures name the file.
-    void withDatabase(const std::function<void()>& work) const
-    {
-        try {
-            work();
-        } catch (const Refusal&) {
-            throw;
-        } catch (const Failure& failure) {
-            throw Failure(
-                u"%1: %2"_s.arg(QDir::toNativeSeparators(m_database), failure.description()));
-        }
-    }
-
     // Work over a connection of its own, in one transaction: all of it is
     // stored, or after any failure none of it.
     void inOneTransaction(const std::function<void(Connection&)>& work) const
     {
-        withDatabase([&] {
-            Connection connection(m_database);
-            Connection::Transaction transaction(connection);
-            try {
-                work(connection);
-            } catch (...) {
-                transaction.rollback();
-                throw;
-            }
-            transaction.commit();
-        });
+        Connection connection(m_database);
+        Connection::Transaction transaction(connection);
+        work(connection);
+        transaction.commit();
     }
 
     // Both panes for the choice, filled as the window fills them.
-    void fillPanes(NameLists& lists, const ListChoice& choice) const
-    {
-        withDatabase([&] { lists.RefreshLists(choice); });
-    }
+    void fillPanes(NameLists& lists, const ListChoice& choice) const { lists.RefreshLists(choice); }
 
     // Bytes to standard output, flushed to the end when asked.
     void write(QByteArrayView bytes, bool flush = true) const
@@ -378,6 +351,7 @@ private:
     QString m_name;
     QStringList m_arguments;
     QString m_database;
+    QString m_programFolder;
     std::FILE* m_out;
     QCommandLineParser m_parser;
 };
@@ -450,12 +424,6 @@ GenerateRequest Command::readGenerate()
     } else if (!request.output.isEmpty()) {
         request.format = formatOfFile(request.output);
     }
-    // The one file whose loss a typing slip must never cause.
-    if (!request.output.isEmpty()
-        && QFileInfo(request.output).canonicalFilePath()
-               == QFileInfo(m_database).canonicalFilePath()
-        && QFileInfo::exists(request.output))
-        usage(u"-o %1 would replace the names database."_s.arg(request.output), m_name);
 
     if (const auto* rows = std::get_if<RowFormat>(&request.format)) {
         request.run.shardUnit = rowsKeptTogether(*rows);
@@ -496,8 +464,7 @@ int Command::generate()
         return Companion::Done;
     const GenerateRequest request = readGenerate();
 
-    NoPointer pointer;
-    NameLists lists(m_database, pointer);
+    NameLists lists(m_database);
     fillPanes(lists, request.list);
     const QString refusal = emptyPaneRefusal(lists.firstPane().count(), lists.lastPane().count());
     if (!refusal.isEmpty())
@@ -509,21 +476,27 @@ int Command::generate()
         random.seedFromTimeOfDay(SystemClock().secondsSinceMidnight());
     const NameRun run(lists.firstPane().names(), lists.lastPane().names(), random, request.run);
 
-    if (const auto* layout = std::get_if<OutputChoice>(&request.format)) {
-        writeWorkbook(run, *layout, request.output);
-        return Companion::Done;
-    }
-    const RowFormat format = std::get<RowFormat>(request.format);
-    if (request.output.isEmpty()) {
+    // The names database is never written over; here a slip of the
+    // command line, so a usage error.
+    try {
+        if (const auto* layout = std::get_if<OutputChoice>(&request.format)) {
+            writeWorkbook(run, *layout, request.output, m_database);
+            return Companion::Done;
+        }
+        const RowFormat format = std::get<RowFormat>(request.format);
+        if (request.output.isEmpty()) {
+            writeRows(run, format, request.table, request.threads,
+                      [this](QByteArrayView bytes) { write(bytes, false); });
+            write({}, true);
+            return Companion::Done;
+        }
+        const std::unique_ptr<SafeFile> file = openResultsFile(request.output, m_database);
         writeRows(run, format, request.table, request.threads,
-                  [this](QByteArrayView bytes) { write(bytes, false); });
-        write({}, true);
-        return Companion::Done;
+                  [&file](QByteArrayView bytes) { file->write(bytes); });
+        file->commit();
+    } catch (const NamesDatabaseRefusal&) {
+        usage(u"-o %1 would replace the names database."_s.arg(request.output), m_name);
     }
-    SafeFile file(request.output);
-    writeRows(run, format, request.table, request.threads,
-              [&file](QByteArrayView bytes) { file.write(bytes); });
-    file.commit();
     return Companion::Done;
 }
 
@@ -533,8 +506,7 @@ int Command::names()
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(true);
-    NoPointer pointer;
-    NameLists lists(m_database, pointer);
+    NameLists lists(m_database);
     fillPanes(lists, list);
     const PaneModel& pane = which == ListKind::FirstNames ? lists.firstPane() : lists.lastPane();
     QByteArray bytes;
@@ -552,18 +524,10 @@ int Command::add()
         return Companion::Done;
     const ListKind which = kind();
     const ListChoice list = choice(false);
-    // Every name is checked before the database is touched.
-    QStringList stored;
-    for (const QString& typed : m_parser.positionalArguments().mid(1)) {
-        const QString name = nameToStore(typed, list);
-        if (name.isEmpty())
-            throw Failure(u"The name \"%1\" is blank: nothing was added."_s.arg(typed));
-        stored.append(name);
-    }
-    inOneTransaction([&](Connection& connection) {
-        for (const QString& name : std::as_const(stored))
-            connection.execute(insertStatement(which, list), name);
-    });
+    const QStringList typed = m_parser.positionalArguments().mid(1);
+    std::optional<Connection> connection;
+    addNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list, typed,
+             BlankNames::Refuse);
     return Companion::Done;
 }
 
@@ -575,17 +539,10 @@ int Command::remove()
     const ListChoice list = choice(true);
     if (list.user)
         usage(u"Your own list is emptied as a whole: use 'quillane-cli clear'."_s, m_name);
-    inOneTransaction([&](Connection& connection) {
-        for (const QString& name : m_parser.positionalArguments().mid(1)) {
-            int deleted = 0;
-            for (const char* sql : builtInDeletes(which, list)) {
-                connection.execute(sql, name);
-                deleted += connection.changes();
-            }
-            if (deleted == 0)
-                throw Refusal(u"\"%1\" is not in the list: nothing was deleted."_s.arg(name));
-        }
-    });
+    const QStringList names = m_parser.positionalArguments().mid(1);
+    std::optional<Connection> connection;
+    deleteNames([&]() -> Connection& { return connection.emplace(m_database); }, which, list, names,
+                AbsentNames::Refuse);
     return Companion::Done;
 }
 
@@ -594,7 +551,8 @@ int Command::clear()
     if (!parse({}, 1, 1))
         return Companion::Done;
     const ListKind which = kind();
-    inOneTransaction([&](Connection& connection) { connection.execute(clearStatement(which)); });
+    Connection connection(m_database);
+    clearList(connection, which);
     return Companion::Done;
 }
 
@@ -605,44 +563,30 @@ int Command::import()
     const ListKind which = kind();
     const ListChoice list = choice(false);
     const QStringList paths = m_parser.positionalArguments().mid(1);
-    for (const QString& path : paths) {
-        if (!FileExists(path))
-            throw Failure(u"File not found: %1"_s.arg(path));
-    }
 
-    // The files stand or fall together: one transaction holds them all.
+    // The files stand or fall together: one transaction holds them all, and
+    // the first file that cannot be read, or any refused name, ends it.
     inOneTransaction([&](Connection& connection) {
         QStringList reports;
         for (const QString& path : paths) {
-            NameFileImport import(connection, path, insertStatement(which, list));
-            try {
-                import.openFile();
-            } catch (const Failure& failure) {
-                throw Refusal(u"%1: %2"_s.arg(path, failure.description()));
-            }
-            import.begin();
-            int rejected = 0;
-            std::vector<NameSplitter::Name> names;
-            bool reading = true;
-            while (reading) {
-                names.clear();
-                reading = import.readNames(names);
-                for (const NameSplitter::Name& name : names) {
-                    try {
-                        import.store(name);
-                    } catch (const Failure& failure) {
-                        if (++rejected <= MaxImportReportsPerFile)
-                            reports.append(u"%1: %2"_s.arg(path, failure.description()));
-                    }
-                }
-            }
-            if (rejected > MaxImportReportsPerFile)
-                reports.append(
-                    u"%1: %2"_s.arg(path, moreRejected(rejected - MaxImportReportsPerFile)));
-            import.rebuildIndexes();
+            importNameFile([&]() -> Connection& { return connection; }, path, which, list,
+                           [&](const ImportProblem& problem) {
+                               switch (problem.culprit) {
+                               case ImportCulprit::Name:
+                                   reports.append(u"%1: %2"_s.arg(path, problem.description));
+                                   return;
+                               case ImportCulprit::File:
+                                   // The other reports name the file themselves.
+                                   if (problem.step == ImportStep::FindFile)
+                                       throw Failure(u"%1: %2"_s.arg(problem.description, path));
+                                   throw Failure(problem.description);
+                               case ImportCulprit::Database:
+                                   throw Failure(problem.description);
+                               }
+                           });
         }
         if (!reports.isEmpty())
-            throw Refusal(reports.join(u"\n"_s) + u" Nothing was imported."_s);
+            throw Failure(reports.join(u"\n"_s) + u" Nothing was imported."_s);
     });
     return Companion::Done;
 }
@@ -654,12 +598,14 @@ namespace Companion {
 int run(const QStringList& arguments, const QString& programFolder, std::FILE* out, std::FILE* err)
 {
     // Every line of a complaint names the program, as a script's log
-    // shows it among other programs' lines.
+    // shows it among other programs' lines. A complaint may quote a file or
+    // an argument, whose control characters a terminal would obey.
     const auto complain = [err](const QString& message) {
         for (const QString& line : message.split(u'\n'))
-            std::fputs(qUtf8Printable(Program + u": "_s + line + u'\n'), err);
+            std::fputs(qUtf8Printable(Program + u": "_s + escapeControlCharacters(line) + u'\n'),
+                       err);
     };
-    QString database = namesDatabasePath(programFolder);
+    QString database;
     try {
         // The options before the command, then the command and its own.
         qsizetype at = 1;
@@ -670,8 +616,12 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
                 return Done;
             }
             if (option == u"--version") {
-                std::fputs(
-                    qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'), out);
+                const QString where =
+                    database.isEmpty() ? describeNamesDatabase(chooseNamesDatabase(programFolder))
+                                       : u"names database: "_s + database;
+                std::fputs(qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'
+                                          + where + u'\n'),
+                           out);
                 return Done;
             }
             if (option == u"--database" && at + 1 < arguments.size())
@@ -686,7 +636,7 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
         const QString name = arguments.at(at);
         if (!CommandHelp.contains(name))
             usage(u"'%1' is not a command."_s.arg(name));
-        Command command(name, arguments.mid(at + 1), database, out);
+        Command command(name, arguments.mid(at + 1), database, programFolder, out);
         return command.run();
     } catch (const UsageProblem& problem) {
         // One line, the way to the help included.

@@ -18,13 +18,6 @@
 #include <optional>
 #include <vector>
 
-// One draw: a whole number from 1 to n, each equally likely, as a real
-// number. Exact for every n of 32 bits: r * n never rounds up to n.
-inline double RandomIndex(RandomSource& random, int n)
-{
-    return std::floor(random.next() * n) + 1.0;
-}
-
 // The text without any U+0020; tabs and other blanks stay.
 QString StripSpaces(const QString& text);
 
@@ -101,8 +94,8 @@ struct GeneratedNames {
 // window and on the command line.
 inline NamePair drawPositions(RandomSource& random, int firstCount, int lastCount)
 {
-    // For a draw of 0 or more, truncation is the floor of RandomIndex less
-    // one, without the library call.
+    // For a draw of 0 or more, truncation is the floor, without the library
+    // call; r * n never rounds up to n for any n of 32 bits.
     const auto last = std::uint32_t(random.next() * lastCount);
     const auto first = std::uint32_t(random.next() * firstCount);
     return {first, last};

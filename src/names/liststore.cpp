@@ -2,7 +2,10 @@
 
 #include "base/failure.h"
 
+#include <QDir>
 #include <QFileInfo>
+
+#include <algorithm>
 
 using namespace Qt::StringLiterals;
 
@@ -32,11 +35,51 @@ const char* insertTable(const char* insert)
     return "user_lastname";
 }
 
-// Throws the report for a name longer than a list stores.
-[[noreturn]] void refuseOverlong(const QString& text)
+bool isControl(QChar c)
 {
-    throw Failure(u"The name \"%1...\" is longer than %2 characters and was not stored."_s.arg(
-        text.left(QuotedLength), QString::number(NameSplitter::MaxNameLength)));
+    const QChar::Category category = c.category();
+    return category == QChar::Other_Control || category == QChar::Separator_Line
+           || category == QChar::Separator_Paragraph;
+}
+
+// The text with its control characters written out, so that a message never
+// carries a line break or a terminal's escape sequence.
+QString visible(const QString& text)
+{
+    QString shown;
+    for (const QChar c : text) {
+        if (c == u'\t')
+            shown += u"\\t"_s;
+        else if (c == u'\n')
+            shown += u"\\n"_s;
+        else if (c == u'\r')
+            shown += u"\\r"_s;
+        else if (isControl(c))
+            shown += u"\\u%1"_s.arg(uint(c.unicode()), 4, 16, QChar(u'0'));
+        else
+            shown += c;
+    }
+    return shown;
+}
+
+// Throws the report for a name that no list stores: one longer than a list
+// holds, or one with a control character (a line break, a tab, an escape),
+// which would break every line, file and terminal the name reaches later.
+void requireStorable(const QString& text, qsizetype length)
+{
+    if (length > NameSplitter::MaxNameLength)
+        throw Failure(u"The name \"%1...\" is longer than %2 characters and was not stored."_s.arg(
+            visible(text.left(QuotedLength)), QString::number(NameSplitter::MaxNameLength)));
+    if (std::any_of(text.begin(), text.end(), isControl))
+        throw Failure(
+            u"The name \"%1\" holds a control character and was not stored."_s.arg(visible(text)));
+}
+
+// Only spaces make a reply blank: a tab or a no-break space is a character
+// that the user typed.
+bool isBlank(const QString& text)
+{
+    return std::all_of(text.begin(), text.end(), [](QChar c) { return c == u' '; });
 }
 
 } // namespace
@@ -76,10 +119,9 @@ QString moreRejected(int count)
 QString nameToStore(const QString& typed, const ListChoice& choice)
 {
     const QString name = QString(typed).remove(u'\'');
-    if (name.trimmed().isEmpty() || (!choice.builtIn && !choice.user))
+    if (isBlank(name) || (!choice.builtIn && !choice.user))
         return {};
-    if (name.size() > NameSplitter::MaxNameLength)
-        refuseOverlong(name);
+    requireStorable(name, name.size());
     return name;
 }
 
@@ -96,10 +138,9 @@ void NameFileImport::openFile()
 {
     // A device or a pipe could be read without end.
     if (!QFileInfo(m_file.fileName()).isFile())
-        throw Failure(
-            u"This is not a file that names can be read from: %1"_s.arg(m_file.fileName()));
+        throw Failure(u"%1 is not a file that names can be read from."_s.arg(fileName()));
     if (!m_file.open(QIODevice::ReadOnly))
-        throw Failure(m_file.errorString());
+        throw Failure(u"The file %1 cannot be read: %2"_s.arg(fileName(), m_file.errorString()));
 }
 
 void NameFileImport::begin()
@@ -133,7 +174,8 @@ bool NameFileImport::readNames(std::vector<NameSplitter::Name>& names)
         m_buffer.resize(ReadChunkBytes);
     const qint64 got = m_file.read(m_buffer.data(), m_buffer.size());
     if (got < 0)
-        throw Failure(m_file.errorString());
+        throw Failure(u"The file %1 could not be read to its end: %2"_s.arg(fileName(),
+                                                                            m_file.errorString()));
     if (got == 0) {
         m_splitter.finish(names);
         m_finished = true;
@@ -143,10 +185,19 @@ bool NameFileImport::readNames(std::vector<NameSplitter::Name>& names)
     return true;
 }
 
+QString NameFileImport::fileName() const
+{
+    return QDir::toNativeSeparators(m_file.fileName());
+}
+
+bool NameFileImport::isText() const
+{
+    return m_splitter.isText();
+}
+
 void NameFileImport::store(const NameSplitter::Name& name)
 {
-    if (name.overlong())
-        refuseOverlong(name.text);
+    requireStorable(name.text, name.length);
     if (!m_prepared)
         throw Failure(u"The import has not begun."_s);
     m_prepared->run(name.text);

@@ -1,10 +1,8 @@
 #pragma once
 
-// What the list buttons do to the names database, apart from any window:
-// the statement each chooses for the source and gender, the rules a name
-// must pass, and the import of a text file. The main window runs these under
-// its error traps, a step at a time; the command-line companion runs them
-// directly and stops at the first failure.
+// The pieces of the list operations (names/listoperations.h): the statement
+// each chooses for the source and gender, the rules a name must pass, and the
+// reading and storing of one text file.
 
 #include "names/database.h"
 #include "names/listchoice.h"
@@ -33,8 +31,9 @@ QList<const char*> builtInDeletes(ListKind kind, const ListChoice& choice);
 const char* clearStatement(ListKind kind);
 
 // The name that a typed text stores: the text without its apostrophes.
-// Empty when nothing is to be stored: a text of nothing but blanks, or a
-// choice with no source selected. A name that is too long is refused.
+// Empty when nothing is to be stored: a text of nothing but spaces, or a
+// choice with no source selected. A name that is too long or holds a control
+// character is refused (Failure).
 QString nameToStore(const QString& typed, const ListChoice& choice);
 
 // A file with more rejected names than this reports the first ones and
@@ -62,8 +61,12 @@ public:
     // Appends the names of the file's next piece; false once the end is
     // reached (the file's last name may come with that call).
     bool readNames(std::vector<NameSplitter::Name>& names);
-    // Inserts one name; an overlong one is refused.
+    // False once the start of the file has shown that it is not text.
+    bool isText() const;
+    // Inserts one name; one that no list stores is refused, as a typed one.
     void store(const NameSplitter::Name& name);
+    // The file's name as the user writes it.
+    QString fileName() const;
     // Builds the indexes that a large file's import dropped.
     void rebuildIndexes();
     // Both end the import's own transaction; a joined one stays open.

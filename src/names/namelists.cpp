@@ -1,17 +1,14 @@
 #include "names/namelists.h"
 
-#include "base/pointer.h"
 #include "names/database.h"
 
-NameLists::NameLists(QString databasePath, PointerOwner& window)
+NameLists::NameLists(QString databasePath)
     : m_databasePath(std::move(databasePath))
-    , m_window(window)
 {
 }
 
 void NameLists::RefreshLists(const ListChoice& choice)
 {
-    BusyPointer busy(m_window);
     Connection connection(m_databasePath);
     if (choice.user) {
         m_firstPane.setNames(connection.queryNames(Sql::UserFirstNames));

@@ -5,14 +5,12 @@
 
 #include <QString>
 
-class PointerOwner;
-
 // The two list panes of the main window and their filling from the names
 // database. The panes are the working set of generation; the database is
-// only read here.
+// only read here. A window shows the hourglass while they fill.
 class NameLists {
 public:
-    NameLists(QString databasePath, PointerOwner& window);
+    explicit NameLists(QString databasePath);
 
     PaneModel& firstPane() { return m_firstPane; }
     PaneModel& lastPane() { return m_lastPane; }
@@ -21,12 +19,11 @@ public:
     // Rebuilds both panes from the database for the chosen source and gender.
     // A pane is replaced only once its query has succeeded, so a failing query
     // leaves that pane as it was; a group with no option selected leaves its
-    // panes as they are. Shows the hourglass meanwhile. Throws Failure.
+    // panes as they are. Throws Failure.
     void RefreshLists(const ListChoice& choice);
 
 private:
     QString m_databasePath;
-    PointerOwner& m_window;
     PaneModel m_firstPane;
     PaneModel m_lastPane;
 };

@@ -4,7 +4,6 @@
 #include "results/resultrows.h"
 #include "results/spreadsheet.h"
 
-#include <QFileInfo>
 #include <QStringEncoder>
 
 #include <algorithm>
@@ -290,14 +289,11 @@ QString workbookRefusal(std::int64_t count)
     return u"A worksheet holds at most %1 rows: ask for fewer names, or for csv."_s.arg(SheetRows);
 }
 
-void writeWorkbook(const NameRun& run, OutputChoice layout, const QString& path)
+void writeWorkbook(const NameRun& run, OutputChoice layout, const QString& path,
+                   const QString& namesDatabase)
 {
     const QString refusal = workbookRefusal(run.count());
     if (!refusal.isEmpty())
         throw Failure(refusal);
-    const QString target = QFileInfo(path).absoluteFilePath();
-    WorkbookFile book(QFileInfo(target).absolutePath());
-    fillSheet(book.sheet(), layout, RunRows(run));
-    book.close();
-    book.moveTo(target, true);
+    saveWorkbook(RunRows(run), layout, path, namesDatabase);
 }

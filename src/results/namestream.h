@@ -44,5 +44,7 @@ inline constexpr std::int64_t SheetRows = 1048576;
 QString workbookRefusal(std::int64_t count);
 
 // Writes the whole run as a workbook at path, in the layout of the results
-// window's spreadsheet choices; throws Failure (the refusal above too).
-void writeWorkbook(const NameRun& run, OutputChoice layout, const QString& path);
+// window's spreadsheet choices, as saving writes every workbook (never over
+// the names database); throws Failure (the refusal above too).
+void writeWorkbook(const NameRun& run, OutputChoice layout, const QString& path,
+                   const QString& namesDatabase);

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "base/safefile.h"
 #include "results/outputchoice.h"
 
 #include <QByteArray>
@@ -59,34 +60,44 @@ private:
 // and last name in columns A and B, or the full name in column A.
 void fillSheet(Worksheet& sheet, OutputChoice layout, const ResultRows& rows);
 
-// An .xlsx file with one sheet, written as it is filled and built under a
-// hidden name of its own in its folder: it gets its real name only once it
-// is complete, so a failure halfway leaves nothing that looks like a
-// workbook of names. Destroyed before then, it leaves nothing behind.
+// An .xlsx file with one sheet, written as it is filled and given its
+// place only once it is complete (see SafeFile): a failure halfway leaves
+// what the path named as it was. Destroyed before save(), it leaves nothing
+// behind. libxlsxwriter's own messages on standard error are kept back: the
+// failure it causes is the one message.
 class WorkbookFile {
 public:
-    explicit WorkbookFile(const QString& folder);
+    explicit WorkbookFile(std::unique_ptr<SafeFile> file);
     ~WorkbookFile();
     WorkbookFile(const WorkbookFile&) = delete;
     WorkbookFile& operator=(const WorkbookFile&) = delete;
 
     Worksheet& sheet() { return m_sheet; }
 
-    // Writes out the rest of the file, complete under its hidden name.
-    void close();
-    // Gives the closed file the name path. Without replace an existing file
-    // of that name stays and the answer is false; with it, the file takes
-    // the place of what was there in one step, keeping its permissions.
-    bool moveTo(const QString& path, bool replace);
+    // Writes out the rest of the workbook and gives it its place.
+    void save();
+    // Where it goes, as given.
+    const QString& path() const;
 
 private:
     void discard();
 
-    QString m_folder;
-    QString m_partPath;
+    // libxlsxwriter writes files of its own all along.
+    WriteSignalsHeld m_signals;
+    std::unique_ptr<SafeFile> m_file;
+    // Where libxlsxwriter writes: the safe file's temporary file, or, for a
+    // device or a FIFO that is written directly, a file of its own in the
+    // temporary folder, copied there once complete.
+    std::unique_ptr<SafeFile> m_staging;
     lxw_workbook* m_book = nullptr;
     Worksheet m_sheet;
 };
+
+// Saves the results list as a workbook at path, replacing what it names,
+// with the layout of fillSheet; never over the names database (namesDatabase;
+// empty for none). Throws Failure.
+void saveWorkbook(const ResultRows& rows, OutputChoice layout, const QString& path,
+                  const QString& namesDatabase);
 
 class Workbook {
 public:
@@ -94,7 +105,7 @@ public:
 
 private:
     friend class SpreadsheetApplication;
-    explicit Workbook(const QString& folder);
+    explicit Workbook(const QString& path);
 
     WorkbookFile m_file;
 };
@@ -115,9 +126,9 @@ private:
 class SpreadsheetApplication {
 public:
     // folder: where the finished workbook is put for the desktop's program
-    // (made if missing). The file is named for the moment it is made, so
+    // (made if missing). The file is named for the moment it is added, so
     // the user recognises it in the program's title bar:
-    // "Quillane names 2026-12-06 21.30.05.xlsx".
+    // "Quillane names 2026-12-06 21.30.05.xlsx"; it never replaces a file.
     SpreadsheetApplication(Shell& shell, QString folder);
     // An application that was never made visible takes its workbook with
     // it: the unfinished file is removed.

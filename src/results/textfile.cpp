@@ -1,14 +1,14 @@
 #include "results/textfile.h"
 
-#include "base/failure.h"
+#include "base/safefile.h"
 #include "results/namestream.h"
 #include "results/resultrows.h"
+#include "results/resultsfile.h"
 
-#include <QDir>
-#include <QSaveFile>
 #include <QStringEncoder>
 
 #include <algorithm>
+#include <memory>
 #include <optional>
 #include <vector>
 
@@ -144,24 +144,9 @@ QByteArray resultsCsv(const ResultRows& rows)
     return encodeRows(rows, {"first_name,last_name\r\n", ',', "\r\n", csvField});
 }
 
-void WriteTextFile(const QByteArray& text, const QString& path)
+void WriteTextFile(const QByteArray& text, const QString& path, const QString& namesDatabase)
 {
-    const auto fail = [&path](const QString& reason) {
-        return Failure(
-            u"The file %1 could not be saved: %2"_s.arg(QDir::toNativeSeparators(path), reason));
-    };
-
-    QSaveFile file(path);
-    // Without the fallback a folder where no temporary file can be made is
-    // a failure too, instead of a direct write that could cut the old file.
-    file.setDirectWriteFallback(false);
-    if (!file.open(QIODevice::WriteOnly))
-        throw fail(file.errorString());
-    if (file.write(text) != text.size()) {
-        const QString reason = file.errorString();
-        file.cancelWriting();
-        throw fail(reason);
-    }
-    if (!file.commit())
-        throw fail(file.errorString());
+    const std::unique_ptr<SafeFile> file = openResultsFile(path, namesDatabase);
+    file->write(text);
+    file->commit();
 }

@@ -18,9 +18,9 @@ QByteArray resultsText(const ResultRows& rows);
 QByteArray resultsLines(const ResultRows& rows);
 QByteArray resultsCsv(const ResultRows& rows);
 
-// Writes text to path, replacing whatever the file held. The text goes to a
-// temporary file beside the target that takes the target's place only once
-// it is complete and on disk: a failure (no write access, a full disk, a
-// path that names a folder) throws Failure with the file system's
-// description and leaves an existing file exactly as it was.
-void WriteTextFile(const QByteArray& text, const QString& path);
+// Writes text to path, replacing what it names, as SafeFile describes: a
+// failure (no write access, a full disk, a path that names a folder) throws
+// Failure with the system's description and leaves an existing file as it
+// was. The names database (namesDatabase; empty for none) is never written
+// over: NamesDatabaseRefusal.
+void WriteTextFile(const QByteArray& text, const QString& path, const QString& namesDatabase);

@@ -50,6 +50,7 @@ struct ChildProgram {
         , environment{dialogs, *settings, shell, clock, random, QString::fromLocal8Bit(argv[2])}
     {
         app.setDialogs(&dialogs);
+        settings->reportWriteFailuresTo(&dialogs);
         std::setvbuf(stdout, nullptr, _IONBF, 0); // printed at once, even just before an end
     }
 

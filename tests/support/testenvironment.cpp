@@ -50,6 +50,7 @@ TestEnvironment::TestEnvironment(bool shippedDatabase)
     : settings((useTemporarySettings(), std::make_unique<Settings>()))
     , environment{dialogs, *settings, shell, clock, random, m_folder.path()}
 {
+    settings->reportWriteFailuresTo(&dialogs);
     if (shippedDatabase && !QFile::copy(QString::fromUtf8(QUILLANE_SHIPPED_DB), databasePath()))
         qFatal("cannot copy the shipped database");
     QFile(databasePath()).setPermissions(QFile::ReadOwner | QFile::WriteOwner);

@@ -41,6 +41,15 @@ public:
     Environment environment;
 };
 
+// The names database's tables, and the one column of each, in the same order.
+inline const QStringList DatabaseTables{
+    QStringLiteral("system_mfirstname"), QStringLiteral("system_ffirstname"),
+    QStringLiteral("system_lastname"), QStringLiteral("user_firstname"),
+    QStringLiteral("user_lastname")};
+inline const QStringList DatabaseColumns{QStringLiteral("Mfirst"), QStringLiteral("Ffirst"),
+                                         QStringLiteral("Last"), QStringLiteral("firstname"),
+                                         QStringLiteral("lastname")};
+
 // A names database with the program's tables and no rows.
 void createEmptyDatabase(const QString& path);
 

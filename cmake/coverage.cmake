@@ -1,0 +1,11 @@
+# QUILLANE_COVERAGE: every target of ours counts the lines and branches it
+# runs (gcc's --coverage), for scripts/coverage.sh to report. Use it with a
+# Debug build, so that the counts follow the source lines.
+option(QUILLANE_COVERAGE "Count line and branch coverage (gcc --coverage)" OFF)
+if(QUILLANE_COVERAGE)
+    if(NOT CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
+        message(FATAL_ERROR "QUILLANE_COVERAGE needs gcc; this is ${CMAKE_CXX_COMPILER_ID}")
+    endif()
+    target_compile_options(quillane_options INTERFACE --coverage)
+    target_link_options(quillane_options INTERFACE --coverage)
+endif()

@@ -1,0 +1,203 @@
+// Which names database the program works on, the user's own copy of it, and
+// the removal of old workbooks from the cache folder.
+#include "base/failure.h"
+#include "base/programfiles.h"
+#include "results/spreadsheet.h"
+#include "support/testenvironment.h"
+
+#include <QTest>
+
+#include <unistd.h>
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+void setAge(const QString& path, int days)
+{
+    QFile file(path);
+    QVERIFY(file.open(QIODevice::ReadWrite));
+    QVERIFY(file.setFileTime(QDateTime::currentDateTime().addDays(-days).addSecs(-60),
+                             QFileDevice::FileModificationTime));
+}
+
+} // namespace
+
+class TestProgramFiles : public QObject {
+    Q_OBJECT
+
+private Q_SLOTS:
+    void choice_data()
+    {
+        QTest::addColumn<QString>("state"); // of the program folder's names.mdb
+        QTest::addColumn<bool>("ownCopy");
+        QTest::newRow("writable") << u"writable"_s << false;
+        // Missing: the database reports it under the name the user knows.
+        QTest::newRow("missing") << u"missing"_s << false;
+        QTest::newRow("read-only file") << u"read-only file"_s << true;
+        QTest::newRow("read-only folder") << u"read-only folder"_s << true;
+    }
+
+    // Deciding changes nothing; only the use of a choice makes the copy,
+    // once, from the shipped file, which stays as it was.
+    void choice()
+    {
+        QFETCH(QString, state);
+        QFETCH(bool, ownCopy);
+        if (ownCopy && ::geteuid() == 0)
+            QSKIP("root writes whatever the modes say; the package test runs this as another user");
+        QTemporaryDir data;
+        qputenv("XDG_DATA_HOME", data.path().toUtf8());
+        TestEnvironment env(state != u"missing"_s);
+        const QString shipped = env.databasePath();
+        const QByteArray before = QFile::exists(shipped) ? fileBytes(shipped) : QByteArray();
+        if (state == u"read-only file"_s)
+            QFile::setPermissions(shipped, QFileDevice::ReadOwner);
+        if (state == u"read-only folder"_s)
+            QFile::setPermissions(env.folder(), QFileDevice::ReadOwner | QFileDevice::ExeOwner);
+
+        const QString copy = data.path() + u"/quillane/names.mdb"_s;
+        const NamesDatabaseChoice choice = chooseNamesDatabase(env.folder());
+        QCOMPARE(choice.ownCopy, ownCopy);
+        QCOMPARE(choice.path, ownCopy ? copy : shipped);
+        QVERIFY(!QFile::exists(copy));
+        QVERIFY(describeNamesDatabase(choice).contains(choice.path));
+
+        QCOMPARE(namesDatabaseInUse(env.folder()), choice.path);
+        QCOMPARE(QFile::exists(copy), ownCopy);
+        if (ownCopy) {
+            QCOMPARE(fileBytes(copy), before);
+            QVERIFY(QFileInfo(copy).isWritable());
+        }
+        QFile::setPermissions(env.folder(), QFileDevice::ReadOwner | QFileDevice::WriteOwner
+                                                | QFileDevice::ExeOwner);
+        if (state != u"missing"_s)
+            QCOMPARE(fileBytes(shipped), before);
+        qunsetenv("XDG_DATA_HOME");
+    }
+
+    void userDataFolder_data()
+    {
+        QTest::addColumn<QByteArray>("dataHome");
+        QTest::addColumn<QString>("expected"); // below the home folder when relative
+        QTest::newRow("set") << QByteArray("/srv/data/") << u"/srv/data/quillane"_s;
+        QTest::newRow("unset") << QByteArray() << u".local/share/quillane"_s;
+        QTest::newRow("relative, so ignored") << QByteArray("data") << u".local/share/quillane"_s;
+    }
+
+    void userDataFolder()
+    {
+        QFETCH(QByteArray, dataHome);
+        QFETCH(QString, expected);
+        if (dataHome.isNull())
+            qunsetenv("XDG_DATA_HOME");
+        else
+            qputenv("XDG_DATA_HOME", dataHome);
+        QCOMPARE(::userDataFolder(),
+                 QDir::isAbsolutePath(expected) ? expected : QDir::home().filePath(expected));
+        qunsetenv("XDG_DATA_HOME");
+    }
+
+    void makeOwnCopy_data()
+    {
+        QTest::addColumn<QString>("state");
+        QTest::addColumn<bool>("fails");
+        QTest::newRow("first use, from a read-only file") << u"first use"_s << false;
+        QTest::newRow("made before: kept") << u"made before"_s << false;
+        QTest::newRow("a file where the folder goes") << u"blocked"_s << true;
+        QTest::newRow("shipped file missing") << u"no shipped"_s << true;
+    }
+
+    // A copy appears complete or not at all; an existing one is the user's
+    // and is never replaced.
+    void makeOwnCopy()
+    {
+        QFETCH(QString, state);
+        QFETCH(bool, fails);
+        QTemporaryDir work;
+        const QString shipped = work.filePath(u"names.mdb"_s);
+        const QString folder = work.filePath(u"data/quillane"_s);
+        const QString copy = folder + u"/names.mdb"_s;
+        if (state != u"no shipped"_s) {
+            writeBytes(shipped, "shipped lists");
+            QFile::setPermissions(shipped, QFileDevice::ReadOwner | QFileDevice::ReadOther);
+        }
+        if (state == u"made before"_s) {
+            QDir().mkpath(folder);
+            writeBytes(copy, "the user's names");
+        }
+        if (state == u"blocked"_s)
+            writeBytes(work.filePath(u"data"_s), "in the way");
+
+        try {
+            ::makeOwnCopy(shipped, copy);
+            QVERIFY(!fails);
+        } catch (const Failure& failure) {
+            QVERIFY2(fails, qPrintable(failure.description()));
+            QVERIFY2(failure.description().contains(copy), qPrintable(failure.description()));
+        }
+        if (fails) {
+            QVERIFY(!QFile::exists(copy));
+            QCOMPARE(QDir(folder).entryList(QDir::Files | QDir::Hidden), QStringList());
+            return;
+        }
+        QCOMPARE(fileBytes(copy),
+                 state == u"made before"_s ? QByteArray("the user's names") : "shipped lists");
+        QVERIFY(QFileInfo(copy).permissions() & QFileDevice::WriteOwner);
+        QCOMPARE(QDir(folder).entryList(QDir::Files | QDir::Hidden), QStringList{u"names.mdb"_s});
+    }
+
+    void oldWorkbooks_data()
+    {
+        QTest::addColumn<QString>("name"); // in the cache folder
+        QTest::addColumn<QString>("kind"); // file, link (to an old file elsewhere), folder
+        QTest::addColumn<int>("days");     // age
+        QTest::addColumn<bool>("removed");
+        const QString made = u"Quillane names 2026-11-01 10.00.00.xlsx"_s;
+        QTest::newRow("made, 8 days") << made << u"file"_s << 8 << true;
+        QTest::newRow("made, 6 days") << made << u"file"_s << 6 << false;
+        QTest::newRow("made second in a second")
+            << u"Quillane names 2026-11-01 10.00.00 (2).xlsx"_s << u"file"_s << 30 << true;
+        QTest::newRow("left unfinished")
+            << u".Quillane names a1B2c3.xlsx.part"_s << u"file"_s << 30 << true;
+        QTest::newRow("the user's workbook") << u"budget.xlsx"_s << u"file"_s << 30 << false;
+        QTest::newRow("a name like ours")
+            << u"Quillane names of mine.xlsx"_s << u"file"_s << 30 << false;
+        QTest::newRow("renamed copy") << made + u".bak"_s << u"file"_s << 30 << false;
+        QTest::newRow("a link") << made << u"link"_s << 30 << false;
+        QTest::newRow("a folder") << made << u"folder"_s << 30 << false;
+        QTest::newRow("below the cache folder") << u"sub/"_s + made << u"file"_s << 30 << false;
+    }
+
+    // Making a spreadsheet for the user clears the old ones out of its folder.
+    void oldWorkbooks()
+    {
+        QFETCH(QString, name);
+        QFETCH(QString, kind);
+        QFETCH(int, days);
+        QFETCH(bool, removed);
+        QTemporaryDir work;
+        const QString cache = work.filePath(u"cache"_s);
+        const QString path = cache + u'/' + name;
+        const QString outside = work.filePath(u"elsewhere.xlsx"_s);
+        QDir().mkpath(QFileInfo(path).absolutePath());
+        writeBytes(outside, "kept");
+        setAge(outside, days);
+        if (kind == u"file"_s) {
+            writeBytes(path, "workbook");
+            setAge(path, days);
+        } else if (kind == u"link"_s) {
+            QVERIFY(QFile::link(outside, path));
+        } else {
+            QVERIFY(QDir().mkpath(path));
+        }
+
+        FakeShell shell;
+        SpreadsheetApplication spreadsheet(shell, cache);
+        QCOMPARE(QFileInfo(path).exists() || QFileInfo(path).isSymLink(), !removed);
+        QVERIFY(QFile::exists(outside));
+    }
+};
+
+QTEST_GUILESS_MAIN(TestProgramFiles)
+#include "tst_programfiles.moc"
