@@ -11,6 +11,8 @@
 # Environment: BUILD_DIR (default: build), QUILLANE_WERROR=ON to fail on
 # warnings, QUILLANE_SANITIZE=ON for an AddressSanitizer/UBSan build,
 # QUILLANE_COVERAGE=ON for a build that counts coverage (scripts/coverage.sh).
+# run, test and build set each of these (default OFF, and a Release build);
+# package keeps those of a build folder already configured, unless set.
 set -euo pipefail
 
 mode=${1:-}
@@ -42,11 +44,27 @@ packages=(
 
 install_missing "${packages[@]}"
 
-cmake -S "$top" -B "$build" -G Ninja \
-    -DCMAKE_BUILD_TYPE="${CMAKE_BUILD_TYPE:-Release}" \
-    -DQUILLANE_WERROR="${QUILLANE_WERROR:-OFF}" \
-    -DQUILLANE_SANITIZE="${QUILLANE_SANITIZE:-OFF}" \
-    -DQUILLANE_COVERAGE="${QUILLANE_COVERAGE:-OFF}"
+# Making the package leaves a configured build folder's options as they are
+# (a developer's -Werror build stays one): only what the environment sets
+# is passed on. Every other mode, and a new build folder, gets the defaults.
+configure=(-S "$top" -B "$build")
+reuse=
+[ "$mode" = package ] && [ -e "$build/CMakeCache.txt" ] && reuse=1
+[ -n "$reuse" ] || configure+=(-G Ninja)
+for setting in CMAKE_BUILD_TYPE=Release QUILLANE_WERROR=OFF QUILLANE_SANITIZE=OFF \
+               QUILLANE_COVERAGE=OFF; do
+    name=${setting%%=*}
+    if [ -n "${!name:-}" ] || [ -z "$reuse" ]; then
+        configure+=("-D$name=${!name:-${setting#*=}}")
+    fi
+done
+cmake "${configure[@]}"
+if [ "$mode" = package ] \
+    && grep -Eiqs '^QUILLANE_(SANITIZE|COVERAGE):BOOL=(ON|1|TRUE|YES|Y)$' "$build/CMakeCache.txt"; then
+    echo "$build is a sanitizer or coverage build, which is no build to ship;" \
+         "make the package from another (BUILD_DIR=build-package $0 package)" >&2
+    exit 1
+fi
 cmake --build "$build"
 
 case "$mode" in

@@ -2,6 +2,7 @@
 // the removal of old workbooks from the cache folder.
 #include "base/failure.h"
 #include "base/programfiles.h"
+#include "base/safefile.h"
 #include "results/spreadsheet.h"
 #include "support/testenvironment.h"
 
@@ -106,6 +107,10 @@ private Q_SLOTS:
         QTest::newRow("made before: kept") << u"made before"_s << false;
         QTest::newRow("a file where the folder goes") << u"blocked"_s << true;
         QTest::newRow("shipped file missing") << u"no shipped"_s << true;
+        // What a start killed while copying left is cleared away.
+        QTest::newRow("a killed start's part file") << u"stale part"_s << false;
+        // Not followed, not replaced: the name is taken.
+        QTest::newRow("a dangling link where the copy goes") << u"dangling link"_s << true;
     }
 
     // A copy appears complete or not at all; an existing one is the user's
@@ -128,6 +133,16 @@ private Q_SLOTS:
         }
         if (state == u"blocked"_s)
             writeBytes(work.filePath(u"data"_s), "in the way");
+        if (state == u"stale part"_s) {
+            QDir().mkpath(folder);
+            const QString part = folder + u'/' + SafeFile::temporaryPrefix(1) + u"aB3dE6.part"_s;
+            writeBytes(part, "half a copy");
+            setAge(part, 2);
+        }
+        if (state == u"dangling link"_s) {
+            QDir().mkpath(folder);
+            QVERIFY(QFile::link(work.filePath(u"nowhere.mdb"_s), copy));
+        }
 
         try {
             ::makeOwnCopy(shipped, copy);
@@ -138,7 +153,9 @@ private Q_SLOTS:
         }
         if (fails) {
             QVERIFY(!QFile::exists(copy));
-            QCOMPARE(QDir(folder).entryList(QDir::Files | QDir::Hidden), QStringList());
+            QCOMPARE(QDir(folder).entryList(QDir::Files | QDir::Hidden | QDir::System),
+                     state == u"dangling link"_s ? QStringList{u"names.mdb"_s} : QStringList());
+            QVERIFY(!QFile::exists(work.filePath(u"nowhere.mdb"_s)));
             return;
         }
         QCOMPARE(fileBytes(copy),

@@ -1,14 +1,11 @@
 #include "base/programfiles.h"
 
 #include "base/failure.h"
+#include "base/safefile.h"
 
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
-#include <QTemporaryFile>
-
-#include <cerrno>
-#include <cstring>
 
 #include <unistd.h>
 
@@ -75,36 +72,30 @@ void makeOwnCopy(const QString& shipped, const QString& copy)
     if (!QDir().mkpath(folder))
         throw Failure(u"Your own names list %1 cannot be made: the folder %2 cannot be made"_s.arg(
             where, QDir::toNativeSeparators(folder)));
-    // Built under a hidden name and given its own only when complete, never
-    // over one that another start made meanwhile.
-    QTemporaryFile part(QDir(folder).filePath(u".names.mdb.XXXXXX"_s));
     QFile source(shipped);
-    bool copied = part.open() && source.open(QIODevice::ReadOnly);
-    while (copied && !source.atEnd()) {
-        const QByteArray block = source.read(1 << 20);
-        copied = source.error() == QFileDevice::NoError && part.write(block) == block.size();
-    }
-    copied = copied && part.flush() && ::fsync(part.handle()) == 0;
-    if (!copied) {
-        const QString reason =
-            part.error() != QFileDevice::NoError || !part.isOpen()
-                ? part.errorString()
-                : u"%1: %2"_s.arg(QDir::toNativeSeparators(shipped), source.errorString());
-        throw Failure(u"Your own names list %1 cannot be made: %2"_s.arg(where, reason));
-    }
-    part.setPermissions(QFileDevice::ReadOwner | QFileDevice::WriteOwner | QFileDevice::ReadGroup
-                        | QFileDevice::ReadOther);
-    part.close();
-    const QByteArray from = QFile::encodeName(part.fileName());
-    const QByteArray to = QFile::encodeName(copy);
-    // link() refuses an existing name, where rename() would replace it; a
-    // file system without links gets Qt's rename, which refuses one too.
-    if (::link(from.constData(), to.constData()) != 0) {
-        const int error = errno;
-        if (!QFileInfo::exists(copy) && !QFile::rename(part.fileName(), copy)
-            && !QFileInfo::exists(copy))
-            throw Failure(u"Your own names list %1 cannot be made: %2"_s.arg(
-                where, QString::fromLocal8Bit(std::strerror(error))));
+    const auto unreadable = [&] {
+        return Failure(u"Your own names list %1 cannot be made: %2: %3"_s.arg(
+            where, QDir::toNativeSeparators(shipped), source.errorString()));
+    };
+    if (!source.open(QIODevice::ReadOnly))
+        throw unreadable();
+    try {
+        // Made new, so never over a copy that another start made meanwhile;
+        // with the mode of any new file, so the user may write it whatever
+        // the shipped file's own mode.
+        SafeFile part(copy, SafeFile::Mode::CreateNew);
+        while (!source.atEnd()) {
+            const QByteArray block = source.read(1 << 20);
+            if (source.error() != QFileDevice::NoError)
+                throw unreadable();
+            part.write(block);
+        }
+        part.commit();
+    } catch (const Failure&) {
+        // Another start that won the race made the same copy.
+        if (QFileInfo::exists(copy))
+            return;
+        throw;
     }
 }
 
