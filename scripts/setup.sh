@@ -32,6 +32,8 @@ packages=(
     fonts-liberation2 xdg-utils
     # for the headless tests and the reading back of saved workbooks
     xvfb xauth dbus python3-openpyxl
+    # for loading quillane-cli's SQL output in a test
+    sqlite3
     # for the package (dpkg-shlibdeps, file) and for checking what it holds
     dpkg-dev file lintian appstream desktop-file-utils bash-completion
     # for scripts/coverage.sh

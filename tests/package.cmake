@@ -200,7 +200,7 @@ if(EXISTS "${bash_completion}")
     ]=])
     run(offered bash -c "${script}" bash "${bash_completion}"
         "${root}/usr/share/bash-completion/completions/quillane-cli")
-    set(wanted "generate\nadd\ntext lines csv xlsx2 xlsx1\nfirst last\nfemale\n")
+    set(wanted "generate\nadd\ntext lines csv tsv jsonl sql xlsx2 xlsx1\nfirst last\nfemale\n")
     if(NOT offered STREQUAL wanted)
         fail("The bash completion offers:\n${offered}")
     endif()

@@ -2,17 +2,27 @@
 // as a child process over a copy of the shipped database, its exit status,
 // its standard output and error, the files it writes, and what a failed run
 // leaves behind.
-#include "names/database.h"
 #include "app/form2.h"
+#include "names/database.h"
 #include "support/controls.h"
 #include "support/program.h"
 #include "support/workbook.h"
 
 #include <QButtonGroup>
+#include <QJsonArray>
+#include <QJsonDocument>
 #include <QLineEdit>
 #include <QPushButton>
 #include <QRadioButton>
+#include <QStandardPaths>
 #include <QTableView>
+
+#include <fcntl.h>
+#include <spawn.h>
+#include <sys/resource.h>
+#include <sys/wait.h>
+
+extern char** environ;
 
 using namespace Qt::StringLiterals;
 
@@ -40,6 +50,47 @@ Run cli(const QStringList& arguments, const QString& locale = u"C.UTF-8"_s)
     run.out = process.readAllStandardOutput();
     run.err = process.readAllStandardError();
     return run;
+}
+
+// The peak resident memory, in kB, of quillane-cli run with the arguments
+// and its standard output thrown away; -1 when it did not end well.
+long peakKilobytes(const QStringList& arguments)
+{
+    std::vector<QByteArray> bytes{QFile::encodeName(Cli)};
+    for (const QString& argument : arguments)
+        bytes.push_back(argument.toUtf8());
+    std::vector<char*> argv;
+    for (QByteArray& argument : bytes)
+        argv.push_back(argument.data());
+    argv.push_back(nullptr);
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_addopen(&actions, 1, "/dev/null", O_WRONLY, 0);
+    pid_t pid = 0;
+    const int spawned = posix_spawn(&pid, argv[0], &actions, nullptr, argv.data(), environ);
+    posix_spawn_file_actions_destroy(&actions);
+    if (spawned != 0)
+        return -1;
+    int status = 0;
+    rusage usage{};
+    wait4(pid, &status, 0, &usage);
+    return WIFEXITED(status) && WEXITSTATUS(status) == 0 ? usage.ru_maxrss : -1;
+}
+
+// Rows as another program read them back: one JSON array [first, last] a
+// line.
+QList<QStringList> readBack(const QByteArray& printed)
+{
+    QList<QStringList> rows;
+    for (const QByteArray& line : printed.split('\n')) {
+        if (line.isEmpty())
+            continue;
+        QStringList row;
+        for (const QJsonValue& value : QJsonDocument::fromJson(line).array())
+            row.append(value.toString());
+        rows.append(row);
+    }
+    return rows;
 }
 
 QStringList lines(const QByteArray& bytes)
@@ -96,9 +147,32 @@ private Q_SLOTS:
         QTest::newRow("count not a number")
             << QStringList{u"generate"_s, u"-n"_s, u"ten"_s} << 2
             << u"quillane-cli: How many does not appear to be a number."_s;
-        QTest::newRow("count too large")
-            << QStringList{u"generate"_s, u"--count"_s, u"1000001"_s} << 2
-            << u"quillane-cli: You must select an amount less than one million."_s;
+        QTest::newRow("count below zero")
+            << QStringList{u"generate"_s, u"-n"_s, u"-5"_s} << 2
+            << u"quillane-cli: -n takes a count of 0 or more, not '-5'."_s;
+        QTest::newRow("count far below zero")
+            << QStringList{u"generate"_s, u"-n"_s, u"-1e308"_s} << 2
+            << u"quillane-cli: -n takes a count of 0 or more, not '-1e308'."_s;
+        QTest::newRow("count beyond 64 bits")
+            << QStringList{u"generate"_s, u"-n"_s, u"1e19"_s} << 2
+            << u"quillane-cli: -n takes at most 9223372036854775807 names, not '1e19'."_s;
+        QTest::newRow("more rows than a sheet holds")
+            << QStringList{u"generate"_s, u"--count"_s, u"1048577"_s, u"-o"_s, u"%1/out.xlsx"_s}
+            << 2 << u"quillane-cli: A worksheet holds at most 1048576 rows"_s;
+        QTest::newRow("a workbook in shards")
+            << QStringList{u"generate"_s, u"-n"_s, u"3"_s,          u"--shard"_s,
+                           u"1/2"_s,      u"-o"_s, u"%1/out.xlsx"_s}
+            << 2 << u"quillane-cli: A workbook is one file: it cannot be made in shards."_s;
+        QTest::newRow("shard beyond the shards")
+            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--shard"_s, u"3/2"_s} << 2
+            << u"quillane-cli: --shard takes I/N, part I of N, with 1 <= I <= N, not '3/2'."_s;
+        QTest::newRow("no threads")
+            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--threads"_s, u"0"_s} << 2
+            << u"quillane-cli: --threads takes a whole number from 1 to 1024, not '0'."_s;
+        QTest::newRow("a table for csv")
+            << QStringList{u"generate"_s, u"-n"_s,       u"3"_s,  u"--table"_s,
+                           u"t"_s,        u"--format"_s, u"csv"_s}
+            << 2 << u"quillane-cli: --table names the table of the sql format."_s;
         QTest::newRow("workbook to standard output")
             << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--format"_s, u"xlsx1"_s} << 2
             << u"quillane-cli: A workbook is written to a file: give -o FILE."_s;
@@ -276,7 +350,8 @@ private Q_SLOTS:
         QTest::addColumn<int>("rows");
         QTest::newRow("plain") << u"25"_s << u"C.UTF-8"_s << 25;
         QTest::newRow("decimal comma") << u"3,5"_s << u"de_DE.UTF-8"_s << 4;
-        QTest::newRow("negative makes none") << u"-5"_s << u"C.UTF-8"_s << 0;
+        QTest::newRow("none") << u"0"_s << u"C.UTF-8"_s << 0;
+        QTest::newRow("beyond the window's bound") << u"1000000.6"_s << u"C.UTF-8"_s << 1000001;
     }
 
     void readsTheCountAsTheWindowDoes()
@@ -285,7 +360,7 @@ private Q_SLOTS:
         QFETCH(QString, locale);
         const Run result = run({u"generate"_s, u"-n"_s, count}, locale);
         QCOMPARE(result.status, 0);
-        QTEST(int(lines(result.out).size()), "rows");
+        QTEST(int(result.out.count('\n')), "rows");
     }
 
     void theSeedReplaysARun()
@@ -400,15 +475,169 @@ private Q_SLOTS:
         QVERIFY2(QString::fromUtf8(result.out).startsWith(start), result.out.constData());
     }
 
+    // A list, and a stream cut off while its threads are still making rows.
+    void aFullStandardOutputIsAFailure_data()
+    {
+        QTest::addColumn<QStringList>("command");
+        QTest::newRow("names") << QStringList{u"names"_s, u"last"_s};
+        QTest::newRow("generate on threads")
+            << QStringList{u"generate"_s, u"-n"_s, u"3000000"_s, u"--threads"_s, u"4"_s};
+    }
+
     void aFullStandardOutputIsAFailure()
     {
+        QFETCH(QStringList, command);
         QProcess process;
         process.setStandardOutputFile(u"/dev/full"_s);
-        process.start(Cli, {u"--database"_s, db, u"names"_s, u"last"_s});
+        process.start(Cli, QStringList{u"--database"_s, db} + command);
         QVERIFY(process.waitForFinished(60000));
         QCOMPARE(process.exitCode(), 1);
         QCOMPARE(process.readAllStandardError(),
                  QByteArray("quillane-cli: standard output: No space left on device\n"));
+    }
+
+    // No two names alike, counted as printed: a list of three first names
+    // and two last names, once their duplicates and the names that tidy
+    // alike are gone, makes all six pairs and no seventh.
+    void uniqueNamesAtTheEdge()
+    {
+        insertRows(db, u"user_firstname"_s, u"firstname"_s,
+                   {u"ann"_s, u"Bob"_s, u"mary ann"_s, u"Maryann"_s, u"ANN"_s});
+        insertRows(db, u"user_lastname"_s, u"lastname"_s, {u"Lee"_s, u"lee"_s, u"Moss"_s});
+        const QStringList generate{u"generate"_s, u"--unique"_s, u"--list"_s, u"user"_s, u"-n"_s};
+        const Run all = run(generate + QStringList{u"6"_s});
+        QCOMPARE(all.status, 0);
+        QStringList names = lines(all.out);
+        names.sort();
+        QCOMPARE(names, (QStringList{u"Ann Lee"_s, u"Ann Moss"_s, u"Bob Lee"_s, u"Bob Moss"_s,
+                                     u"Maryann Lee"_s, u"Maryann Moss"_s}));
+
+        const Run tooMany = run(generate + QStringList{u"7"_s});
+        QCOMPARE(tooMany.status, 1);
+        QVERIFY(tooMany.out.isEmpty());
+        QCOMPARE(tooMany.err, "quillane-cli: These lists make 6 different names: ask for at most "
+                              "6, not 7.\n");
+    }
+
+    // With one seed, shards 1 to N one after another are the whole run, for
+    // counts that N does not divide, with and without --unique; and the
+    // thread count changes no byte.
+    void shardsMakeTheWholeRun_data()
+    {
+        QTest::addColumn<QStringList>("options");
+        QTest::newRow("lines") << QStringList{u"-n"_s, u"10"_s};
+        QTest::newRow("csv, unique")
+            << QStringList{u"-n"_s, u"101"_s, u"--format"_s, u"csv"_s, u"--unique"_s};
+        QTest::newRow("sql, unique")
+            << QStringList{u"-n"_s, u"2500"_s, u"--format"_s, u"sql"_s, u"--unique"_s};
+        QTest::newRow("tsv, several blocks")
+            << QStringList{u"-n"_s, u"70001"_s, u"--format"_s, u"tsv"_s};
+        QTest::newRow("jsonl, unique, several blocks")
+            << QStringList{u"-n"_s, u"70001"_s, u"--format"_s, u"jsonl"_s, u"--unique"_s};
+    }
+
+    void shardsMakeTheWholeRun()
+    {
+        QFETCH(QStringList, options);
+        const QStringList generate = QStringList{u"generate"_s, u"--seed"_s, u"5"_s} + options;
+        const Run whole = run(generate + QStringList{u"--threads"_s, u"1"_s});
+        QCOMPARE(whole.status, 0);
+        QCOMPARE(run(generate + QStringList{u"--threads"_s, u"4"_s}).out, whole.out);
+        for (const int shards : {1, 2, 3, 7}) {
+            QByteArray joined;
+            for (int shard = 1; shard <= shards; ++shard) {
+                const Run part =
+                    run(generate + QStringList{u"--shard"_s, u"%1/%2"_s.arg(shard).arg(shards)});
+                QCOMPARE(part.status, 0);
+                joined += part.out;
+            }
+            QVERIFY2(joined == whole.out, qPrintable(u"%1 shards"_s.arg(shards)));
+        }
+    }
+
+    // Each format loads in a program that reads it: Python's csv and json,
+    // the sqlite3 shell. Quotes, backslashes, commas, tabs and letters
+    // beyond ASCII come back as the lines format prints them. The file's
+    // ending chooses the format, in any capitals.
+    void formatsLoadInOtherPrograms_data()
+    {
+        QTest::addColumn<QString>("file");
+        QTest::addColumn<QString>("reader");
+        QTest::addColumn<QStringList>("arguments"); // %1 the file
+        QTest::addColumn<QByteArray>("input");      // %1 the file
+        const QString python = u"/usr/bin/python3"_s;
+        const QString csv =
+            u"import csv, json, sys\n"
+            u"rows = list(csv.reader(open(sys.argv[1], newline='', encoding='utf-8'), "
+            u"delimiter=sys.argv[2]))\n"
+            u"assert rows[0] == ['first_name', 'last_name'], rows[0]\n"
+            u"for row in rows[1:]: print(json.dumps(row))\n"_s;
+        QTest::newRow("csv") << u"names.csv"_s << python
+                             << QStringList{u"-c"_s, csv, u"%1"_s, u","_s} << QByteArray();
+        QTest::newRow("tsv") << u"names.TSV"_s << python
+                             << QStringList{u"-c"_s, csv, u"%1"_s, u"\t"_s} << QByteArray();
+        QTest::newRow("jsonl")
+            << u"names.jsonl"_s << python
+            << QStringList{u"-c"_s,
+                           u"import json, sys\n"
+                           u"for line in open(sys.argv[1], encoding='utf-8'):\n"
+                           u"    row = json.loads(line)\n"
+                           u"    assert list(row) == ['first_name', 'last_name'], row\n"
+                           u"    print(json.dumps([row['first_name'], row['last_name']]))\n"_s,
+                           u"%1"_s}
+            << QByteArray();
+        QTest::newRow("sql") << u"names.Sql"_s << u"sqlite3"_s << QStringList{u"-batch"_s}
+                             << QByteArray("create table \"test people\" (first_name text, "
+                                           "last_name text);\n"
+                                           ".read '%1'\n"
+                                           "select json_array(first_name, last_name) from "
+                                           "\"test people\" order by rowid;\n");
+    }
+
+    void formatsLoadInOtherPrograms()
+    {
+        QFETCH(QString, file);
+        QFETCH(QString, reader);
+        QFETCH(QStringList, arguments);
+        QFETCH(QByteArray, input);
+        if (QStandardPaths::findExecutable(reader).isEmpty())
+            QSKIP(qPrintable(reader + u" is not installed"_s));
+        insertRows(db, u"user_firstname"_s, u"firstname"_s,
+                   {u"o\"hara"_s, u"back\\slash"_s, u"comma,jr"_s, u"tab\there"_s, u"zo\u00eb"_s,
+                    u"d'arcy"_s, u"\u00c5SA"_s});
+        insertRows(db, u"user_lastname"_s, u"lastname"_s,
+                   {u"m\u00fcller"_s, u"semi;colon"_s, u"x\"y,z"_s, u"a\tb"_s, u"ends\\"_s});
+        const QStringList generate{u"generate"_s, u"-n"_s,   u"35"_s,     u"--unique"_s,
+                                   u"--list"_s,   u"user"_s, u"--seed"_s, u"11"_s};
+        QList<QStringList> expected;
+        for (const QString& line : lines(run(generate).out))
+            expected.append({line.section(u' ', 0, 0), line.section(u' ', 1)});
+        QCOMPARE(expected.size(), 35);
+
+        const QString path = env->filePath(file);
+        QStringList options{u"-o"_s, path};
+        if (file.endsWith(u".Sql"_s))
+            options << u"--table"_s << u"test people"_s;
+        const Run written = run(generate + options);
+        QCOMPARE(written.status, 0);
+        QProcess process;
+        process.start(reader, arguments.replaceInStrings(u"%1"_s, path));
+        process.write(input.replace("%1", QFile::encodeName(path)));
+        process.closeWriteChannel();
+        QVERIFY(process.waitForFinished(60000));
+        QVERIFY2(process.exitCode() == 0, process.readAllStandardError().constData());
+        QCOMPARE(readBack(process.readAllStandardOutput()), expected);
+    }
+
+    // Memory does not grow with the count: fifty times the names, about the
+    // same peak (a run that kept its rows would need 8 bytes a row more).
+    void memoryDoesNotGrowWithTheCount()
+    {
+        const QStringList generate{u"--database"_s, db, u"generate"_s, u"-n"_s};
+        const long few = peakKilobytes(generate + QStringList{u"100000"_s});
+        const long many = peakKilobytes(generate + QStringList{u"5000000"_s});
+        QVERIFY(few > 0 && many > 0);
+        QVERIFY2(many < few + 16 * 1024, qPrintable(u"%1 kB, then %2 kB"_s.arg(few).arg(many)));
     }
 };
 

@@ -1,12 +1,17 @@
 // Generation without windows: the count box's reading, the tidying of names,
-// the draws and the progress a run reports.
+// the draws and the progress a run reports, and the streamed runs of the
+// command line: jumps, shards and the permutation of distinct pairs.
 #include "generate/generation.h"
+#include "generate/namerun.h"
 #include "support/randomindex.h"
+
+#include "base/failure.h"
 
 #include <QTest>
 
 #include <cmath>
 #include <numeric>
+#include <set>
 
 using namespace Qt::StringLiterals;
 
@@ -132,6 +137,176 @@ private Q_SLOTS:
         QList<int> seen;
         NameGenerator(pane, pane, random).generate(count, [&](int v) { seen.append(v); });
         QTEST(seen, "values");
+    }
+
+    // A jump lands where drawing would: checked by drawing for short jumps
+    // and by two jumps against one for long ones.
+    void jumpsWhereDrawingGoes_data()
+    {
+        QTest::addColumn<quint64>("first");
+        QTest::addColumn<quint64>("second");
+        QTest::newRow("none") << quint64(0) << quint64(0);
+        QTest::newRow("one") << quint64(1) << quint64(0);
+        QTest::newRow("across a word of bits") << quint64(63) << quint64(66);
+        QTest::newRow("a long run's block") << quint64(65536) << quint64(12345);
+        QTest::newRow("far") << (quint64(1) << 40) << (quint64(3) << 61);
+    }
+
+    void jumpsWhereDrawingGoes()
+    {
+        QFETCH(quint64, first);
+        QFETCH(quint64, second);
+        RandomSource jumped;
+        jumped.seed(99);
+        RandomSource reference = jumped;
+        jumped.jump(first);
+        jumped.jump(second);
+        if (first + second < 1000000) {
+            for (quint64 i = 0; i < first + second; ++i)
+                reference.nextBits();
+        } else {
+            reference.jump(first + second);
+        }
+        QCOMPARE(jumped.nextBits(), reference.nextBits());
+    }
+
+    // Any part of a streamed run holds the window's names for the same seed.
+    void aRunsPartsAreTheWindowsNames()
+    {
+        const QStringList firsts{u"ann"_s, u"BOB"_s, u" cy "_s, u"dee"_s, u"eve"_s};
+        const QStringList lasts{u"SMITH"_s, u"o'brien"_s, u"lee"_s};
+        RandomSource random;
+        random.seed(7);
+        const NameRun run(firsts, lasts, random, {.count = 3000});
+        const GeneratedNames window = NameGenerator(firsts, lasts, random).generate(3000);
+        for (const std::int64_t from : {0, 1, 999, 2950}) {
+            std::vector<NamePair> pairs(50);
+            run.pairs(from, pairs);
+            for (std::size_t i = 0; i < pairs.size(); ++i) {
+                const NamePair& row = window.rows[std::size_t(from) + i];
+                QCOMPARE(run.firstNames().at(pairs[i].first), window.firstNames.at(row.first));
+                QCOMPARE(run.lastNames().at(pairs[i].last), window.lastNames.at(row.last));
+            }
+        }
+    }
+
+    // Shards one after another are the whole run, each starting on a unit.
+    void shardsCoverTheRun_data()
+    {
+        QTest::addColumn<qint64>("count");
+        QTest::addColumn<int>("shards");
+        QTest::addColumn<qint64>("unit");
+        QTest::newRow("one shard") << qint64(10) << 1 << qint64(1);
+        QTest::newRow("fewer rows than shards") << qint64(3) << 7 << qint64(1);
+        QTest::newRow("uneven") << qint64(1001) << 3 << qint64(1);
+        QTest::newRow("statements kept whole") << qint64(2500) << 7 << qint64(1000);
+        QTest::newRow("near 2^63") << qint64(0x7fff'ffff'ffff'fff0) << 7 << qint64(1000);
+    }
+
+    void shardsCoverTheRun()
+    {
+        QFETCH(qint64, count);
+        QFETCH(int, shards);
+        QFETCH(qint64, unit);
+        std::int64_t next = 0;
+        std::int64_t fewest = count;
+        std::int64_t most = 0;
+        for (int shard = 1; shard <= shards; ++shard) {
+            const RowRange rows = shardRows(count, shard, shards, unit);
+            QCOMPARE(rows.begin, next);
+            QVERIFY(rows.end >= rows.begin);
+            QVERIFY(rows.begin % unit == 0);
+            next = rows.end;
+            if (shard < shards) {
+                fewest = std::min(fewest, rows.size());
+                most = std::max(most, rows.size());
+            }
+        }
+        QCOMPARE(next, count);
+        QVERIFY(shards == 1 || most - fewest <= unit);
+    }
+
+    // The first size numbers of the permutation are 0 .. size-1, each once,
+    // for sizes at and between powers of two.
+    void thePermutationTakesEachPairOnce()
+    {
+        for (const std::uint64_t size : {1, 2, 3, 4, 5, 6, 7, 16, 17, 1000, 65537}) {
+            RandomSource keys;
+            keys.seed(size);
+            const PairPermutation permutation(size, keys);
+            std::vector<bool> seen(size);
+            for (std::uint64_t i = 0; i < size; ++i) {
+                const std::uint64_t at = permutation.at(i);
+                QVERIFY(at < size && !seen[at]);
+                seen[at] = true;
+            }
+        }
+    }
+
+    // Over many seeds every distinct pair comes first, and comes among the
+    // first few rows, about as often as any other: within five standard
+    // deviations of an equal share.
+    void distinctPairsAreFair_data()
+    {
+        QTest::addColumn<int>("firsts");
+        QTest::addColumn<int>("lasts");
+        QTest::addColumn<int>("rows");
+        QTest::newRow("3 x 2, first row") << 3 << 2 << 1;
+        QTest::newRow("3 x 2, three rows") << 3 << 2 << 3;
+        QTest::newRow("7 x 11, first row") << 7 << 11 << 1;
+        QTest::newRow("5 x 13, ten rows") << 5 << 13 << 10;
+    }
+
+    void distinctPairsAreFair()
+    {
+        QFETCH(int, firsts);
+        QFETCH(int, lasts);
+        QFETCH(int, rows);
+        constexpr int Seeds = 20000;
+        QStringList firstPane;
+        for (int i = 0; i < firsts; ++i)
+            firstPane.append(u"f%1"_s.arg(i));
+        QStringList lastPane;
+        for (int i = 0; i < lasts; ++i)
+            lastPane.append(u"l%1"_s.arg(i));
+        const int pairs = firsts * lasts;
+        std::vector<int> drawn(static_cast<std::size_t>(pairs));
+        std::vector<NamePair> made(static_cast<std::size_t>(rows));
+        for (int seed = 0; seed < Seeds; ++seed) {
+            RandomSource random;
+            random.seed(std::uint64_t(seed));
+            const NameRun run(firstPane, lastPane, random, {.count = rows, .unique = true});
+            run.pairs(0, made);
+            std::set<int> distinct;
+            for (const NamePair& pair : made)
+                distinct.insert(int(pair.first) * lasts + int(pair.last));
+            QCOMPARE(int(distinct.size()), rows);
+            for (const int pair : distinct)
+                ++drawn[std::size_t(pair)];
+        }
+        const double share = double(rows) / pairs;
+        const double sigma = std::sqrt(Seeds * share * (1 - share));
+        for (const int n : drawn)
+            QVERIFY2(std::abs(n - Seeds * share) < 5 * sigma,
+                     qPrintable(u"%1 of %2"_s.arg(n).arg(Seeds * share)));
+    }
+
+    // Names that tidy alike are one name: asking for more pairs than the
+    // different names make is refused with the number they make.
+    void distinctPairsCountNamesAsPrinted()
+    {
+        const QStringList firsts{u"mary ann"_s, u"Maryann"_s, u"BOB"_s, u"bob"_s};
+        const QStringList lasts{u"lee"_s, u"Lee"_s, u"moss"_s};
+        const NameRun run(firsts, lasts, RandomSource(), {.count = 4, .unique = true});
+        QCOMPARE(run.firstNames(), (QStringList{u"Maryann"_s, u"Bob"_s}));
+        QCOMPARE(run.lastNames(), (QStringList{u"Lee"_s, u"Moss"_s}));
+        try {
+            NameRun(firsts, lasts, RandomSource(), {.count = 5, .unique = true});
+            QFAIL("five distinct names out of four");
+        } catch (const Failure& failure) {
+            QCOMPARE(failure.description(),
+                     u"These lists make 4 different names: ask for at most 4, not 5."_s);
+        }
     }
 };
 

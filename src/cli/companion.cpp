@@ -3,11 +3,14 @@
 #include "base/clock.h"
 #include "base/failure.h"
 #include "base/programfiles.h"
+#include "base/safefile.h"
 #include "generate/generation.h"
+#include "generate/namerun.h"
 #include "generate/randomsource.h"
 #include "names/database.h"
 #include "names/listoperations.h"
 #include "names/namelists.h"
+#include "results/namestream.h"
 #include "results/resultsfile.h"
 #include "results/resultsmodel.h"
 #include "results/spreadsheet.h"
@@ -17,18 +20,24 @@
 #include <QDir>
 #include <QFileInfo>
 #include <QLocale>
+#include <QRegularExpression>
 
 #include <cerrno>
 #include <cstring>
 #include <functional>
+#include <limits>
 #include <map>
 #include <optional>
+#include <variant>
 
 using namespace Qt::StringLiterals;
 
 namespace {
 
 const QString Program = u"quillane-cli"_s;
+
+// More threads than this buy nothing on any machine of today.
+constexpr int MaxThreads = 1024;
 
 // A command line that cannot be run as written; command names the
 // subcommand whose help explains it, if any.
@@ -71,25 +80,39 @@ const std::map<QString, const char*> CommandHelp = {
 
 Makes COUNT random full names as the window's "Start Generating" does: for
 each, a last name and a first name drawn from the chosen list, with spaces
-removed and regular capitals.
+removed and regular capitals. The names stream out as they are made, so any
+count takes the same memory.
 
 Options:
-  -n, --count COUNT    how many names, up to 1000000, in your number format
+  -n, --count COUNT    how many names, 0 or more, in your number format
   --list builtin|user  draw from the built-in list (default) or your own
   --gender both|male|female
                        the built-in first names to draw from (default: both)
   --seed N             start the random source at N, a whole number from 0
                        to 18446744073709551615: the same seed gives the same
                        names (default: the time of day)
+  --unique             no two names alike (first and last name as printed);
+                       refused when the list makes fewer than COUNT
+  --shard I/N          make only part I of N of the run: with the same seed,
+                       parts 1 to N one after another are the whole run
+  --threads N          make the names on N threads (default: every core);
+                       the names do not depend on it
   --format FORMAT      text   "First Last" and CR LF per name: the window's
                               text file, byte for byte
                        lines  "First Last" and LF per name
                        csv    comma-separated, with the header line
                               first_name,last_name
+                       tsv    tab-separated, with the header line
+                              first_name<TAB>last_name
+                       jsonl  {"first_name":...,"last_name":...} per line
+                       sql    INSERT statements of up to 1000 names each
                        xlsx2  a workbook, first and last names in columns A, B
                        xlsx1  a workbook, full names in column A
-                       Without it: lines on standard output; with -o, csv or
-                       xlsx2 for a FILE ending in .csv or .xlsx, else text.
+                       (a workbook holds at most 1048576 names)
+                       Without it: lines on standard output; with -o, the
+                       format a FILE ending in .csv, .tsv, .jsonl, .sql or
+                       .xlsx (xlsx2) names, else text.
+  --table NAME         the table the sql format inserts into (default: people)
   -o, --output FILE    write to FILE instead of standard output; an existing
                        FILE is replaced only once the new one is complete
   --database FILE      the names database
@@ -152,12 +175,46 @@ Options:
 )"},
 };
 
-// An output format of generate.
-enum class Format { Text, Lines, Csv, Workbook2, Workbook1 };
+// An output format of generate: a streamed one, or a workbook's layout.
+using Format = std::variant<RowFormat, OutputChoice>;
 
 const std::map<QString, Format> Formats = {
-    {u"text"_s, Format::Text},       {u"lines"_s, Format::Lines},     {u"csv"_s, Format::Csv},
-    {u"xlsx2"_s, Format::Workbook2}, {u"xlsx1"_s, Format::Workbook1},
+    {u"text"_s, RowFormat::Text},
+    {u"lines"_s, RowFormat::Lines},
+    {u"csv"_s, RowFormat::Csv},
+    {u"tsv"_s, RowFormat::Tsv},
+    {u"jsonl"_s, RowFormat::JsonLines},
+    {u"sql"_s, RowFormat::Sql},
+    {u"xlsx2"_s, OutputChoice::SpreadsheetTwoCells},
+    {u"xlsx1"_s, OutputChoice::SpreadsheetOneCell},
+};
+
+// The format a file's name chooses, by its ending in any capitals.
+Format formatOfFile(const QString& path)
+{
+    const std::pair<QString, Format> endings[] = {
+        {u".csv"_s, RowFormat::Csv},
+        {u".tsv"_s, RowFormat::Tsv},
+        {u".jsonl"_s, RowFormat::JsonLines},
+        {u".sql"_s, RowFormat::Sql},
+        {u".xlsx"_s, OutputChoice::SpreadsheetTwoCells},
+    };
+    for (const auto& [ending, format] : endings) {
+        if (path.endsWith(ending, Qt::CaseInsensitive))
+            return format;
+    }
+    return RowFormat::Text;
+}
+
+// What the generate command was asked to do.
+struct GenerateRequest {
+    ListChoice list;
+    std::optional<std::uint64_t> seed;
+    RunOptions run;
+    Format format = RowFormat::Lines;
+    QString table = u"people"_s;
+    int threads = 0; // every core
+    QString output;  // empty: standard output
 };
 
 class Command {
@@ -272,15 +329,18 @@ private:
     // Both panes for the choice, filled as the window fills them.
     void fillPanes(NameLists& lists, const ListChoice& choice) const { lists.RefreshLists(choice); }
 
-    void write(const QByteArray& bytes) const
+    // Bytes to standard output, flushed to the end when asked.
+    void write(QByteArrayView bytes, bool flush = true) const
     {
-        if (std::fwrite(bytes.constData(), 1, std::size_t(bytes.size()), m_out)
-                != std::size_t(bytes.size())
-            || std::fflush(m_out) != 0)
+        if ((!bytes.isEmpty()
+             && std::fwrite(bytes.data(), 1, std::size_t(bytes.size()), m_out)
+                    != std::size_t(bytes.size()))
+            || (flush && std::fflush(m_out) != 0))
             throw Failure(
                 u"standard output: %1"_s.arg(QString::fromLocal8Bit(std::strerror(errno))));
     }
 
+    GenerateRequest readGenerate();
     int generate();
     int names();
     int add();
@@ -296,94 +356,146 @@ private:
     QCommandLineParser m_parser;
 };
 
+GenerateRequest Command::readGenerate()
+{
+    GenerateRequest request;
+    const auto value = [this](const QString& option) { return m_parser.value(option); };
+
+    // The count is read as the window reads its count box, without its bound.
+    if (!m_parser.isSet(u"count"_s))
+        usage(u"How many? Give -n COUNT."_s, m_name);
+    const CountText count(value(u"count"_s), QLocale::system());
+    if (!count.isNumber())
+        usage(GenerationMessages::NotANumber, m_name);
+    if (count.value() < 0)
+        usage(u"-n takes a count of 0 or more, not '%1'."_s.arg(value(u"count"_s)), m_name);
+    const std::optional<std::int64_t> whole = count.wholeCount();
+    if (!whole)
+        usage(u"-n takes at most %1 names, not '%2'."_s.arg(
+                  QString::number(std::numeric_limits<std::int64_t>::max()), value(u"count"_s)),
+              m_name);
+    request.run.count = *whole;
+    request.run.unique = m_parser.isSet(u"unique"_s);
+    request.list = choice(true);
+
+    if (m_parser.isSet(u"seed"_s)) {
+        bool ok = false;
+        const QString text = value(u"seed"_s);
+        const qulonglong seed = text.toULongLong(&ok);
+        if (!ok || text.startsWith(u'-') || text.startsWith(u'+'))
+            usage(u"--seed takes a whole number from 0 to 18446744073709551615, not '%1'."_s.arg(
+                      text),
+                  m_name);
+        request.seed = seed;
+    }
+
+    if (m_parser.isSet(u"shard"_s)) {
+        static const QRegularExpression form(u"^([0-9]{1,9})/([0-9]{1,9})$"_s);
+        const QRegularExpressionMatch match = form.match(value(u"shard"_s));
+        const int shard = match.hasMatch() ? match.captured(1).toInt() : 0;
+        const int shards = match.hasMatch() ? match.captured(2).toInt() : 0;
+        if (shard < 1 || shard > shards)
+            usage(u"--shard takes I/N, part I of N, with 1 <= I <= N, not '%1'."_s.arg(
+                      value(u"shard"_s)),
+                  m_name);
+        request.run.shard = shard;
+        request.run.shards = shards;
+    }
+
+    if (m_parser.isSet(u"threads"_s)) {
+        bool ok = false;
+        request.threads = value(u"threads"_s).toInt(&ok);
+        if (!ok || request.threads < 1 || request.threads > MaxThreads)
+            usage(u"--threads takes a whole number from 1 to %1, not '%2'."_s.arg(
+                      QString::number(MaxThreads), value(u"threads"_s)),
+                  m_name);
+    }
+
+    request.output = value(u"output"_s);
+    if (request.output == u"-")
+        request.output.clear();
+    if (m_parser.isSet(u"format"_s)) {
+        const auto found = Formats.find(value(u"format"_s));
+        if (found == Formats.end())
+            usage(u"--format is text, lines, csv, tsv, jsonl, sql, xlsx2 or xlsx1, not '%1'."_s.arg(
+                      value(u"format"_s)),
+                  m_name);
+        request.format = found->second;
+    } else if (!request.output.isEmpty()) {
+        request.format = formatOfFile(request.output);
+    }
+
+    if (const auto* rows = std::get_if<RowFormat>(&request.format)) {
+        request.run.shardUnit = rowsKeptTogether(*rows);
+        if (m_parser.isSet(u"table"_s)) {
+            if (*rows != RowFormat::Sql)
+                usage(u"--table names the table of the sql format."_s, m_name);
+            request.table = value(u"table"_s);
+            if (request.table.isEmpty())
+                usage(u"--table needs a name."_s, m_name);
+        }
+    } else {
+        if (request.output.isEmpty())
+            usage(u"A workbook is written to a file: give -o FILE."_s, m_name);
+        if (request.run.shards > 1)
+            usage(u"A workbook is one file: it cannot be made in shards."_s, m_name);
+        if (m_parser.isSet(u"table"_s))
+            usage(u"--table names the table of the sql format."_s, m_name);
+        const QString refusal = workbookRefusal(request.run.count);
+        if (!refusal.isEmpty())
+            usage(refusal, m_name);
+    }
+    return request;
+}
+
 int Command::generate()
 {
     if (!parse({{{u"n"_s, u"count"_s}, {}, u"COUNT"_s},
                 listOption(),
                 genderOption(),
                 {u"seed"_s, {}, u"N"_s},
+                {u"unique"_s, {}},
+                {u"shard"_s, {}, u"I/N"_s},
+                {u"threads"_s, {}, u"N"_s},
                 {u"format"_s, {}, u"FORMAT"_s},
+                {u"table"_s, {}, u"NAME"_s},
                 {{u"o"_s, u"output"_s}, {}, u"FILE"_s}},
                0, 0))
         return Companion::Done;
-
-    // The count is read and bounded as the window reads its count box.
-    if (!m_parser.isSet(u"count"_s))
-        usage(u"How many? Give -n COUNT."_s, m_name);
-    const CountText count(m_parser.value(u"count"_s), QLocale::system());
-    if (!count.isNumber())
-        usage(GenerationMessages::NotANumber, m_name);
-    if (count.tooMany())
-        usage(GenerationMessages::TooMany, m_name);
-    const ListChoice list = choice(true);
-
-    std::optional<std::uint64_t> seed;
-    if (m_parser.isSet(u"seed"_s)) {
-        bool ok = false;
-        const QString text = m_parser.value(u"seed"_s);
-        const qulonglong value = text.toULongLong(&ok);
-        if (!ok || text.startsWith(u'-') || text.startsWith(u'+'))
-            usage(u"--seed takes a whole number from 0 to 18446744073709551615, not '%1'."_s.arg(
-                      text),
-                  m_name);
-        seed = value;
-    }
-
-    QString output = m_parser.value(u"output"_s);
-    if (output == u"-")
-        output.clear();
-    Format format = Format::Lines;
-    if (m_parser.isSet(u"format"_s)) {
-        const auto found = Formats.find(m_parser.value(u"format"_s));
-        if (found == Formats.end())
-            usage(u"--format is text, lines, csv, xlsx2 or xlsx1, not '%1'."_s.arg(
-                      m_parser.value(u"format"_s)),
-                  m_name);
-        format = found->second;
-    } else if (!output.isEmpty()) {
-        format = output.endsWith(u".csv"_s, Qt::CaseInsensitive)    ? Format::Csv
-                 : output.endsWith(u".xlsx"_s, Qt::CaseInsensitive) ? Format::Workbook2
-                                                                    : Format::Text;
-    }
-    const bool workbook = format == Format::Workbook2 || format == Format::Workbook1;
-    if (workbook && output.isEmpty())
-        usage(u"A workbook is written to a file: give -o FILE."_s, m_name);
+    const GenerateRequest request = readGenerate();
 
     NameLists lists(m_database);
-    fillPanes(lists, list);
-    const QString refusal =
-        refusalBeforeStart(count, lists.firstPane().count(), lists.lastPane().count());
+    fillPanes(lists, request.list);
+    const QString refusal = emptyPaneRefusal(lists.firstPane().count(), lists.lastPane().count());
     if (!refusal.isEmpty())
         throw Failure(refusal);
-
     RandomSource random;
-    if (seed)
-        random.seed(*seed);
+    if (request.seed)
+        random.seed(*request.seed);
     else
         random.seedFromTimeOfDay(SystemClock().secondsSinceMidnight());
-    NameGenerator generator(lists.firstPane().names(), lists.lastPane().names(), random);
-    ResultsModel rows;
-    rows.setRows(generator.generate(count.count()));
+    const NameRun run(lists.firstPane().names(), lists.lastPane().names(), random, request.run);
 
     // The names database is never written over; here a slip of the
     // command line, so a usage error.
     try {
-        if (workbook) {
-            saveWorkbook(rows,
-                         format == Format::Workbook2 ? OutputChoice::SpreadsheetTwoCells
-                                                     : OutputChoice::SpreadsheetOneCell,
-                         output, m_database);
+        if (const auto* layout = std::get_if<OutputChoice>(&request.format)) {
+            writeWorkbook(run, *layout, request.output, m_database);
             return Companion::Done;
         }
-        const QByteArray bytes = format == Format::Text  ? resultsText(rows)
-                                 : format == Format::Csv ? resultsCsv(rows)
-                                                         : resultsLines(rows);
-        if (output.isEmpty())
-            write(bytes);
-        else
-            WriteTextFile(bytes, output, m_database);
+        const RowFormat format = std::get<RowFormat>(request.format);
+        if (request.output.isEmpty()) {
+            writeRows(run, format, request.table, request.threads,
+                      [this](QByteArrayView bytes) { write(bytes, false); });
+            write({}, true);
+            return Companion::Done;
+        }
+        const std::unique_ptr<SafeFile> file = openResultsFile(request.output, m_database);
+        writeRows(run, format, request.table, request.threads,
+                  [&file](QByteArrayView bytes) { file->write(bytes); });
+        file->commit();
     } catch (const NamesDatabaseRefusal&) {
-        usage(u"-o %1 would replace the names database."_s.arg(output), m_name);
+        usage(u"-o %1 would replace the names database."_s.arg(request.output), m_name);
     }
     return Companion::Done;
 }

@@ -56,6 +56,10 @@ CountText::CountText(const QString& text, const QLocale& locale)
     const double value = locale.toDouble(QStringView(text).trimmed(), &ok);
     m_isNumber = ok && std::isfinite(value);
     m_value = m_isNumber ? value : 0.0;
+    // Beyond 2^53 a double no longer holds every whole number.
+    const qlonglong whole = locale.toLongLong(QStringView(text).trimmed(), &ok);
+    if (ok)
+        m_whole = whole;
 }
 
 std::int32_t CountText::count() const
@@ -71,10 +75,29 @@ std::int32_t CountText::count() const
     return static_cast<std::int32_t>(rounded);
 }
 
+std::optional<std::int64_t> CountText::wholeCount() const
+{
+    if (m_whole)
+        return m_whole;
+    constexpr double beyond = 0x1.0p63; // the first double past the 64-bit range
+    if (!m_isNumber || m_value >= beyond || m_value < -beyond)
+        return std::nullopt;
+    const int previous = std::fegetround();
+    std::fesetround(FE_TONEAREST);
+    const double rounded = std::nearbyint(m_value);
+    std::fesetround(previous);
+    return static_cast<std::int64_t>(rounded);
+}
+
 QString refusalBeforeStart(const CountText& count, qsizetype firstNames, qsizetype lastNames)
 {
     if (count.tooMany())
         return GenerationMessages::TooMany;
+    return emptyPaneRefusal(firstNames, lastNames);
+}
+
+QString emptyPaneRefusal(qsizetype firstNames, qsizetype lastNames)
+{
     if (firstNames == 0)
         return GenerationMessages::NoFirstName;
     if (lastNames == 0)
@@ -115,14 +138,6 @@ private:
     std::vector<std::uint32_t> m_slots;
 };
 
-// A position from 0 to n - 1, each equally likely. For a draw of 0 or more,
-// truncation is the floor, without the library call; r * n never rounds up
-// to n for any n of 32 bits.
-inline int drawPosition(RandomSource& random, int n)
-{
-    return int(random.next() * n);
-}
-
 } // namespace
 
 NameGenerator::NameGenerator(const QStringList& firstPane, const QStringList& lastPane,
@@ -153,10 +168,9 @@ GeneratedNames NameGenerator::generate(std::int32_t count, const Progress& progr
     int shown = -1;
 
     for (std::int64_t i = 1; i <= n; ++i) {
-        const int p = drawPosition(m_random, lastCount);
-        const std::uint32_t last = lasts.at(p);
-        const int q = drawPosition(m_random, firstCount);
-        const std::uint32_t first = firsts.at(q);
+        const NamePair positions = drawPositions(m_random, firstCount, lastCount);
+        const std::uint32_t last = lasts.at(int(positions.last));
+        const std::uint32_t first = firsts.at(int(positions.first));
         names.rows.push_back({first, last});
 
         remainder += 100;

@@ -15,6 +15,7 @@
 #include <cmath>
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <vector>
 
 // The text without any U+0020; tabs and other blanks stay.
@@ -46,9 +47,16 @@ public:
     // texts that are not numbers.
     std::int32_t count() const;
 
+    // The same reading without the window's bound, for runs that stream
+    // their rows: the nearest 64-bit integer, a half to the even neighbour,
+    // exact for whole numbers of any length. None for a text that is not a
+    // number or a number outside the 64-bit range.
+    std::optional<std::int64_t> wholeCount() const;
+
 private:
     bool m_isNumber = false;
     double m_value = 0;
+    std::optional<std::int64_t> m_whole; // when the text is a whole number
 };
 
 namespace GenerationMessages {
@@ -63,6 +71,8 @@ inline const QString NotANumber = QStringLiteral("How many does not appear to be
 // last-name pane. Empty when the run may go on. A text that is not a number
 // passes here; the run refuses it afterwards (NotANumber).
 QString refusalBeforeStart(const CountText& count, qsizetype firstNames, qsizetype lastNames);
+// The same without the bound: for runs that take any count.
+QString emptyPaneRefusal(qsizetype firstNames, qsizetype lastNames);
 
 // One row of results: indices into the run's tables of tidied names.
 struct NamePair {
@@ -77,6 +87,19 @@ struct GeneratedNames {
     QStringList lastNames;
     std::vector<NamePair> rows;
 };
+
+// One full name's two draws, the last name's first: a position in the
+// last-name pane and one in the first-name pane, each from 0. Every way of
+// generating draws through here, so a seed gives the same names in the
+// window and on the command line.
+inline NamePair drawPositions(RandomSource& random, int firstCount, int lastCount)
+{
+    // For a draw of 0 or more, truncation is the floor, without the library
+    // call; r * n never rounds up to n for any n of 32 bits.
+    const auto last = std::uint32_t(random.next() * lastCount);
+    const auto first = std::uint32_t(random.next() * firstCount);
+    return {first, last};
+}
 
 // Generation over two panes. For every full name the last name is drawn
 // first and the first name second, two draws and no more, so the rows replay

@@ -16,6 +16,11 @@ public:
     // The next draw: a real r with 0 <= r < 1 and 53 bits of resolution.
     double next() { return static_cast<double>(nextBits() >> 11) * 0x1.0p-53; }
 
+    // Moves on as steps calls of nextBits() would, in time that grows with
+    // the number of bits of steps, not with steps: a part of a long run
+    // starts where it stands in the whole sequence without drawing the rest.
+    void jump(std::uint64_t steps);
+
     std::uint64_t nextBits()
     {
         const std::uint64_t result = rotl(m_state[1] * 5, 7) * 9;

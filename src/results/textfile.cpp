@@ -1,6 +1,7 @@
 #include "results/textfile.h"
 
 #include "base/safefile.h"
+#include "results/namestream.h"
 #include "results/resultrows.h"
 #include "results/resultsfile.h"
 
@@ -29,14 +30,9 @@ QString asItIs(const QString& name)
     return name;
 }
 
-// A field as a CSV reader takes it back: quoted, with its quotes doubled,
-// when it holds a comma, a quote or a line end.
 QString csvField(const QString& name)
 {
-    const bool plain = std::none_of(name.cbegin(), name.cend(), [](QChar c) {
-        return c == u',' || c == u'"' || c == u'\r' || c == u'\n';
-    });
-    return plain ? name : u'"' + QString(name).replace(u"\""_s, u"\"\""_s) + u'"';
+    return separatedField(name, u',');
 }
 
 // A table of names encoded once, one after another in one buffer.
