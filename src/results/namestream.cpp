@@ -8,6 +8,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <optional>
 #include <vector>
 
 using namespace Qt::StringLiterals;
@@ -135,6 +136,12 @@ Layout layoutOf(RowFormat format)
     return {};
 }
 
+char* copyBytes(char* out, QByteArrayView bytes)
+{
+    std::memcpy(out, bytes.data(), std::size_t(bytes.size()));
+    return out + bytes.size();
+}
+
 // A table of names encoded once, one after another in one buffer, each
 // with the text that goes before and after it in a row.
 class EncodedNames {
@@ -146,18 +153,25 @@ public:
                                QStringEncoder::Flag::Stateless);
         m_starts.reserve(std::size_t(names.size()) + 1);
         m_starts.push_back(0);
+        qsizetype used = 0;
         for (const QString& name : names) {
-            // Through a QByteArray: appending the encoder's result itself
-            // reserves the exact size each time, and the table would be
-            // copied once per name as it grows.
-            const QByteArray encoded = encoder.encode(layout.field(name));
-            m_bytes += before;
-            m_bytes += encoded;
-            m_bytes += after;
-            m_longest = std::max(m_longest, m_bytes.size() - m_starts.back());
-            m_starts.push_back(std::uint32_t(m_bytes.size()));
+            // Encoded straight into place, the buffer doubling when it is
+            // full: growing it by each name's size would copy the whole
+            // table once per name.
+            const QString field = layout.field(name);
+            const qsizetype most =
+                before.size() + encoder.requiredSpace(field.size()) + after.size();
+            if (used + most > m_bytes.size())
+                m_bytes.resize(std::max(m_bytes.size() * 2, used + most));
+            char* const start = m_bytes.data() + used;
+            const char* const end =
+                copyBytes(encoder.appendToBuffer(copyBytes(start, before), field), after);
+            m_longest = std::max(m_longest, qsizetype(end - start));
+            used = end - m_bytes.constData();
+            m_starts.push_back(std::uint32_t(used));
         }
         // A short entry is copied as a whole block of Short bytes.
+        m_bytes.truncate(used);
         m_bytes.append(Short, '\0');
     }
     qsizetype longest() const { return m_longest; }
@@ -186,22 +200,51 @@ private:
     qsizetype m_longest = 0;
 };
 
-char* put(char* out, QByteArrayView bytes)
-{
-    std::memcpy(out, bytes.data(), std::size_t(bytes.size()));
-    return out + bytes.size();
-}
+// What SQL puts around its rows: an INSERT before every SqlBatchRows-th
+// row, and after each row the comma or the semicolon that ends the
+// statement. Other formats put nothing.
+class Statements {
+public:
+    Statements(RowFormat format, const QString& table, std::int64_t count)
+        : m_sql(format == RowFormat::Sql)
+        , m_insert(m_sql ? "INSERT INTO " + sqlIdentifier(table).toUtf8()
+                               + " (first_name, last_name) VALUES\n"
+                         : QByteArray())
+        , m_count(count)
+    {
+    }
+    bool any() const { return m_sql; }
+    // The most bytes around a row.
+    qsizetype most() const { return m_sql ? m_insert.size() + 2 : 0; }
+    char* open(std::int64_t row, char* to) const
+    {
+        return m_sql && row % SqlBatchRows == 0 ? copyBytes(to, m_insert) : to;
+    }
+    char* close(std::int64_t row, char* to) const
+    {
+        if (!m_sql)
+            return to;
+        return copyBytes(to, row % SqlBatchRows == SqlBatchRows - 1 || row == m_count - 1 ? ";\n"
+                                                                                          : ",\n");
+    }
 
+private:
+    bool m_sql;
+    QByteArray m_insert;
+    std::int64_t m_count;
+};
+
+// The rows of a format over two tables of names: the one place a format's
+// rows are laid out, for the streamed run and the results window alike.
 class FormattedRows : public RowFormatter {
 public:
-    FormattedRows(const NameRun& run, RowFormat format, const QString& table)
+    // count is the number of rows in all: SQL ends its last statement there.
+    FormattedRows(const QStringList& firstNames, const QStringList& lastNames, std::int64_t count,
+                  RowFormat format, const QString& table)
         : m_layout(layoutOf(format))
-        , m_firsts(run.firstNames(), m_layout, m_layout.before, m_layout.between)
-        , m_lasts(run.lastNames(), m_layout, {}, m_layout.after)
-        , m_count(run.count())
-        , m_sql(format == RowFormat::Sql)
-        , m_insert("INSERT INTO " + sqlIdentifier(table).toUtf8()
-                   + " (first_name, last_name) VALUES\n")
+        , m_firsts(firstNames, m_layout, m_layout.before, m_layout.between)
+        , m_lasts(lastNames, m_layout, {}, m_layout.after)
+        , m_statements(format, table, count)
     {
     }
 
@@ -211,22 +254,20 @@ public:
                     QByteArray& out) const override
     {
         // Room for the longest row each time, written straight into place.
-        const qsizetype most =
-            m_firsts.longest() + m_lasts.longest() + (m_sql ? m_insert.size() + 2 : 0);
+        const qsizetype most = m_firsts.longest() + m_lasts.longest() + m_statements.most();
         const qsizetype start = out.size();
         out.resize(start + most * qsizetype(pairs.size()) + qsizetype(EncodedNames::Short));
         char* to = out.data() + start;
-        if (!m_sql) {
+        // Without statements, the loop the most rows run stays the plainest.
+        if (!m_statements.any()) {
             for (const NamePair& pair : pairs)
                 to = m_lasts.put(pair.last, m_firsts.put(pair.first, to));
         } else {
             std::int64_t row = firstRow;
             for (const NamePair& pair : pairs) {
-                if (row % SqlBatchRows == 0)
-                    to = put(to, m_insert);
+                to = m_statements.open(row, to);
                 to = m_lasts.put(pair.last, m_firsts.put(pair.first, to));
-                to = put(to, row % SqlBatchRows == SqlBatchRows - 1 || row == m_count - 1 ? ";\n"
-                                                                                          : ",\n");
+                to = m_statements.close(row, to);
                 ++row;
             }
         }
@@ -237,9 +278,7 @@ private:
     Layout m_layout;
     EncodedNames m_firsts;
     EncodedNames m_lasts;
-    std::int64_t m_count;
-    bool m_sql;
-    QByteArray m_insert;
+    Statements m_statements;
 };
 
 // The rows of a run as saving reads them, made a block at a time as they
@@ -276,10 +315,53 @@ private:
 void writeRows(const NameRun& run, RowFormat format, const QString& table, int threads,
                const ByteSink& sink)
 {
-    const FormattedRows formatter(run, format, table);
+    const FormattedRows formatter(run.firstNames(), run.lastNames(), run.count(), format, table);
     if (run.isFirstShard() && !formatter.layout().header.isEmpty())
         sink(formatter.layout().header);
     streamRows(run, formatter, threads, sink);
+}
+
+QByteArray formatRows(const ResultRows& rows, RowFormat format, const QString& table)
+{
+    const Layout layout = layoutOf(format);
+    QByteArray out = layout.header;
+    if (const std::optional<IndexedNames> indexed = rows.indexedNames()) {
+        // A block at a time: a block has room for its longest row written
+        // once per row, so a long name costs little.
+        constexpr std::size_t Block = 1 << 14;
+        const std::span<const NamePair> pairs(indexed->rows);
+        const FormattedRows formatter(indexed->firstNames, indexed->lastNames,
+                                      std::int64_t(pairs.size()), format, table);
+        for (std::size_t start = 0; start < pairs.size(); start += Block)
+            formatter.appendRows(std::int64_t(start),
+                                 pairs.subspan(start, std::min(Block, pairs.size() - start)), out);
+        return out;
+    }
+
+    // Other rows name by name, in the same layout, straight into the end of
+    // the buffer, which grows by doubling.
+    QStringEncoder encoder(layout.utf8 ? QStringEncoder::Utf8 : QStringEncoder::System,
+                           QStringEncoder::Flag::Stateless);
+    const int count = rows.rowCount();
+    const Statements statements(format, table, count);
+    const qsizetype fixed =
+        layout.before.size() + layout.between.size() + layout.after.size() + statements.most();
+    out.reserve(out.size() + qsizetype(count) * 18);
+    qsizetype used = out.size();
+    for (int row = 0; row < count; ++row) {
+        const QString first = layout.field(rows.firstName(row));
+        const QString last = layout.field(rows.lastName(row));
+        const qsizetype most = used + fixed + encoder.requiredSpace(first.size() + last.size());
+        if (most > out.size())
+            out.resize(std::max(out.size() * 2, most));
+        char* to = statements.open(row, out.data() + used);
+        to = encoder.appendToBuffer(copyBytes(to, layout.before), first);
+        to = encoder.appendToBuffer(copyBytes(to, layout.between), last);
+        to = statements.close(row, copyBytes(to, layout.after));
+        used = to - out.constData();
+    }
+    out.truncate(used);
+    return out;
 }
 
 QString workbookRefusal(std::int64_t count)

@@ -2,14 +2,18 @@
 
 // The writers of a streamed run: every row format a loading program reads,
 // written block by block as the rows are made, and the workbook, written
-// row by row. Memory stays the same whatever the count.
+// row by row. Memory stays the same whatever the count. The results
+// window's text files are laid out by the same rows (formatRows).
 
 #include "generate/rowstream.h"
 #include "results/outputchoice.h"
 
+#include <QByteArray>
 #include <QString>
 
 #include <cstdint>
+
+class ResultRows;
 
 enum class RowFormat {
     Text,      // "First Last" CR LF: the results window's text file
@@ -37,6 +41,11 @@ QString sqlIdentifier(const QString& name);
 // first shard only, then every row. table names the table of SQL inserts.
 void writeRows(const NameRun& run, RowFormat format, const QString& table, int threads,
                const ByteSink& sink);
+
+// The results list's rows in a format, the header line first, in one
+// buffer: the same bytes as a run of the same rows streamed by writeRows.
+// table names the table of SQL inserts.
+QByteArray formatRows(const ResultRows& rows, RowFormat format, const QString& table = {});
 
 // The rows a worksheet holds. A run of more cannot be a workbook: the
 // refusal says so; empty when count fits.
