@@ -1,9 +1,8 @@
 // The main window: start-up from the stored choices, the option clicks, every
 // control of the windows clicked with every table checked afterwards, the
 // count box and its bound, the report cap of a loaded file, the progress bar,
-// the panes, the "Help" message, what a screen reader says, the titles the
-// window system shows, and start-up with an unusable database or settings
-// store.
+// what a screen reader says, the titles the window system shows, and
+// start-up with an unusable database.
 #include "app/form2.h"
 #include "app/qtdialogs.h"
 #include "base/failure.h"
@@ -25,9 +24,6 @@
 using namespace Qt::StringLiterals;
 
 namespace {
-
-// The last names of the built-in list as shipped.
-constexpr int LastNames = 88799;
 
 // What the window shows of the choice, by part: the selected options, the
 // captions of the two buttons that follow the source, whether the gender
@@ -117,6 +113,15 @@ QAbstractItemView* selectName(QWidget& form, const QString& paneAndName)
 class TestForm1 : public QObject {
     Q_OBJECT
 
+    QList<int> m_painted; // the values of the progress bar's paints
+
+    bool eventFilter(QObject* watched, QEvent* event) override
+    {
+        if (event->type() == QEvent::Paint)
+            m_painted.append(qobject_cast<QProgressBar*>(watched)->value());
+        return false;
+    }
+
 private Q_SLOTS:
     // The user list holds "Zoe" and "al" as first names and "Quill" as a last
     // name. The built-in list has 1219 male and 4275 female first names,
@@ -180,8 +185,9 @@ private Q_SLOTS:
         // its pause), input= and file= answer the next prompt or file dialog
         // (a file's lines separated by commas), save answers the save dialog,
         // Text1= types the count, select= and double= select and double-click
-        // a pane's name, key= presses Delete (or the key after a colon) on a
-        // pane.
+        // a pane's name, unselect= leaves a pane's current name unselected,
+        // key= presses Delete (or the key after a colon) on a pane. A name
+        // removed from a pane is back at the next refresh.
         QTest::addColumn<QString>("steps");
         QTest::addColumn<QString>("tables"); // allTables() afterwards
         // The first and the last names shown, the messages, the results
@@ -232,6 +238,10 @@ private Q_SLOTS:
         row("Help", u"PushButton8"_s, start, u"Adam Bo Cleo|Lee Moss|1"_s);
         row("Delete key", u"select=ListView2:Bo key=ListView2"_s, start, u"Adam Cleo|Lee Moss|0"_s);
         row("another key", u"select=ListView1:Moss key=ListView1:L"_s, start, both);
+        row("Delete key, nothing selected",
+            u"select=ListView1:Moss unselect=ListView1 key=ListView1"_s, start, both);
+        row("Delete key, then a refresh", u"select=ListView1:Moss key=ListView1 Option2"_s, start,
+            u"Adam Bo|Lee Moss|0"_s);
         row("double-click", u"double=ListView1:Moss"_s, start, u"Adam Bo Cleo|Lee|0"_s);
         row("double-click, first names", u"double=ListView2:Adam"_s, start,
             u"Bo Cleo|Lee Moss|0"_s);
@@ -285,6 +295,8 @@ private Q_SLOTS:
                 env.dialogs.answerSave(env.filePath(u"saved.txt"_s));
             } else if (step.startsWith(u"select="_s)) {
                 selectName(*form, value);
+            } else if (step.startsWith(u"unselect="_s)) {
+                control<QAbstractItemView>(*form, value)->clearSelection();
             } else if (step.startsWith(u"key="_s)) {
                 auto* pane = control<QWidget>(*form, value.section(u':', 0, 0));
                 const QString key = value.section(u':', 1);
@@ -369,6 +381,8 @@ private Q_SLOTS:
     }
 
     // The bar moves up to full, then goes back to empty for the next run.
+    // The run holds the event loop, so each value is painted on the spot, in
+    // turn; the closing empty bar is painted whenever the window is next.
     void theBarDuringARun()
     {
         QFETCH(int, count);
@@ -376,6 +390,7 @@ private Q_SLOTS:
         fillAllTables(env);
         const auto form = loadedForm1(env.environment, true);
         auto* bar = control<QProgressBar>(*form, u"ProgressBar1"_s);
+        bar->installEventFilter(this);
         QSignalSpy values(bar, &QProgressBar::valueChanged);
         control<QLineEdit>(*form, u"Text1"_s)->setText(QString::number(count));
         control<QAbstractButton>(*form, u"PushButton1"_s)->click();
@@ -383,6 +398,10 @@ private Q_SLOTS:
         for (const QList<QVariant>& value : values)
             seen << value[0].toInt();
         QTEST(seen, "values");
+        qsizetype painted = 0; // of the values seen, in turn
+        for (int value : m_painted)
+            painted += painted < seen.size() && value == seen[painted];
+        QCOMPARE_GE(painted, seen.size() - 1);
     }
 
     void shownTitles_data()
@@ -445,121 +464,6 @@ private Q_SLOTS:
         QCOMPARE(env.settings->read(u"Text1"_s, {}), u"4"_s);
         QTest::keyClick(text1, Qt::Key_2);
         QCOMPARE(env.settings->read(u"Text1"_s, {}), u"42"_s);
-    }
-
-    // A name removed from a pane stays in the database, and the next refresh
-    // brings it back.
-    void removingANameLastsUntilTheNextRefresh_data()
-    {
-        QTest::addColumn<bool>("selected");
-        QTest::addColumn<bool>("byKey");
-        QTest::newRow("Delete key") << true << true;
-        QTest::newRow("double-click") << true << false;
-        QTest::newRow("Delete key, nothing selected") << false << true;
-    }
-
-    void removingANameLastsUntilTheNextRefresh()
-    {
-        QFETCH(bool, selected);
-        QFETCH(bool, byKey);
-        TestEnvironment env;
-        const auto form = loadedForm1(env.environment, true);
-        QVERIFY(QTest::qWaitForWindowExposed(form.get()));
-        auto* pane = control<QAbstractItemView>(*form, u"ListView1"_s);
-        const QModelIndex second = pane->model()->index(1, 0);
-        const QString name = second.data().toString();
-        const QPoint at = pane->visualRect(second).center();
-        pane->setCurrentIndex(second);
-        if (!selected)
-            pane->clearSelection();
-        if (byKey) {
-            QTest::keyClick(pane, Qt::Key_Delete);
-        } else { // a double-click arrives as a click followed by the double-click
-            QTest::mouseClick(pane->viewport(), Qt::LeftButton, {}, at);
-            QTest::mouseDClick(pane->viewport(), Qt::LeftButton, {}, at);
-        }
-        QCOMPARE(shownRowCount(*form, u"ListView1"_s), LastNames - (selected ? 1 : 0));
-        QCOMPARE(shownColumn(*form, u"ListView1"_s).contains(name), !selected);
-        QVERIFY(tableColumn(env.databasePath(), u"system_lastname"_s, u"Last"_s).contains(name));
-        control<QRadioButton>(*form, u"Option2"_s)->click();
-        QCOMPARE(shownRowCount(*form, u"ListView1"_s), LastNames);
-        QVERIFY(env.dialogs.shown.isEmpty());
-    }
-
-    // One plain message that names both sources.
-    void helpExplainsTheTwoSources()
-    {
-        TestEnvironment env;
-        const auto form = loadedForm1(env.environment);
-        QTest::mouseClick(control<QAbstractButton>(*form, u"PushButton8"_s), Qt::LeftButton);
-        QCOMPARE(env.dialogs.shown.size(), 1);
-        const FakeDialogs::Shown& help = env.dialogs.shown[0];
-        QVERIFY2(help.text.contains(u"Orvell's List"_s) && help.text.contains(u"User List"_s),
-                 qPrintable(help.text));
-        QCOMPARE(help.title, u"Quillane"_s);
-        QCOMPARE(help.icon, MessageIcon::None);
-    }
-
-    void startsWithADamagedOrUnwritableStore_data()
-    {
-        QTest::addColumn<QString>("kind"); // of Varnholt.ini: file, folder, link
-        QTest::addColumn<QByteArray>("content");
-        QTest::addColumn<QString>("reason"); // of the one report; empty: none
-        QTest::addColumn<QString>("shown");  // after the user list and 42 were chosen
-
-        const QString user = u"Option1 Option8|Clear Clear|off|42|0 0"_s;
-        QTest::newRow("malformed lines")
-            << u"file"_s
-            << QByteArray("[Quillane]\nOption9=False\n=junk\n\x01\x1b[2J\nOption3=1\n"
-                          "Text1=250\n")
-            << QString() << u"Option3 Option8|Clear Clear|off|42|0 0"_s;
-        QTest::newRow("a folder in its place")
-            << u"folder"_s << QByteArray() << u"Is a directory"_s << user;
-        QTest::newRow("dangling link")
-            << u"link"_s << QByteArray() << u"No such file or directory"_s << user;
-    }
-
-    // The window starts whatever the store's state. A malformed file gives
-    // the choices it holds; a store that cannot be written is reported once,
-    // and the choices made hold until the program ends.
-    void startsWithADamagedOrUnwritableStore()
-    {
-        QFETCH(QString, kind);
-        QFETCH(QByteArray, content);
-        QFETCH(QString, reason);
-        QFETCH(QString, shown);
-        TestEnvironment env;
-        QTemporaryDir store;
-        const QString path = store.filePath(u"Varnholt.ini"_s);
-        if (kind == u"file")
-            writeBytes(path, content);
-        else if (kind == u"folder")
-            QVERIFY(QDir(store.path()).mkdir(u"Varnholt.ini"_s));
-        else
-            QVERIFY(QFile::link(u"missing/Varnholt.ini"_s, path));
-        QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, store.path());
-        Settings settings;
-        settings.reportWriteFailuresTo(&env.dialogs);
-        Environment environment{env.dialogs, settings,   env.shell,
-                                env.clock,   env.random, env.folder()};
-        const auto form = loadedForm1(environment, true);
-        if (kind == u"file")
-            QCOMPARE(control<QLineEdit>(*form, u"Text1"_s)->text(), u"250"_s);
-        control<QRadioButton>(*form, u"Option8"_s)->click();
-        control<QLineEdit>(*form, u"Text1"_s)->setText(u"42"_s);
-        QCOMPARE(shownChoice(*form), shown);
-        QCOMPARE(settings.read(u"Text1"_s, {}), u"42"_s);
-        QCOMPARE(settings.read(u"Option8"_s, {}), u"True"_s);
-        if (reason.isEmpty()) {
-            QVERIFY(env.dialogs.shown.isEmpty());
-            QVERIFY(fileBytes(path).contains("Text1=42\n"));
-        } else {
-            QCOMPARE(env.dialogs.messages().size(), 1);
-            QVERIFY2(env.dialogs.messages()[0].contains(path + u" cannot be written: "_s + reason),
-                     qPrintable(env.dialogs.messages()[0]));
-            QCOMPARE(env.dialogs.shown[0].title, u"Application Error"_s);
-            QCOMPARE(env.dialogs.shown[0].icon, MessageIcon::Exclamation);
-        }
     }
 
     void closingTheMainWindowEndsTheProgram()
