@@ -1,5 +1,6 @@
 // "Start Generating" and the results window: the refusals as the user sees
-// them, the rows, the progress bar, "< Back", saving, and the window itself.
+// them, the rows, "< Back", saving, and the window itself. The progress bar
+// and each output choice: tst_form1.
 #include "app/form1.h"
 #include "app/form2.h"
 #include "support/controls.h"
@@ -15,7 +16,6 @@ class TestForm2 : public QObject {
 
     std::unique_ptr<TestEnvironment> env;
     std::unique_ptr<Form1> form;
-    QList<int> painted; // the values of the progress bar's paints
 
     // Types the count and presses "Start Generating".
     void generate(const QString& count)
@@ -25,13 +25,6 @@ class TestForm2 : public QObject {
     }
     Form2& results() { return *form->resultsWindow(); }
     void click(const QString& name) { control<QAbstractButton>(results(), name)->click(); }
-
-    bool eventFilter(QObject* watched, QEvent* event) override
-    {
-        if (event->type() == QEvent::Paint)
-            painted.append(qobject_cast<QProgressBar*>(watched)->value());
-        return false;
-    }
 
 private Q_SLOTS:
     // Every test starts from a first run of two rows of Ann Lee, the main
@@ -95,22 +88,6 @@ private Q_SLOTS:
         QCOMPARE(form->pointer().mousePointer(), MousePointer::Default);
     }
 
-    void barMovesDuringTheRunAndEndsAtZero()
-    {
-        click(u"PushButton8"_s);
-        auto* bar = control<QProgressBar>(*form, u"ProgressBar1"_s);
-        QApplication::processEvents();
-        bar->installEventFilter(this);
-        generate(u"300000"_s);
-
-        QCOMPARE(bar->value(), 0);
-        // Painted on the spot while the run held the event loop, once per
-        // shown value, 0 to 100 in turn; the window's ordinary paints after
-        // the run may add one or two.
-        for (int v = 0; v <= 100; ++v)
-            QCOMPARE(painted.value(v, -1), v);
-    }
-
     // "< Back" only hides the window: the rows and the output choice stay,
     // the next run shows the same window, and its columns are added once.
     void backKeepsTheRowsAndTheChoice()
@@ -137,31 +114,6 @@ private Q_SLOTS:
         click(u"PushButton8"_s);
         generate(u"2"_s);
         QCOMPARE(shownColumn(results(), u"ListView1"_s), QStringList(2, u"Ann"_s));
-    }
-
-    void savingFollowsTheChosenOutput_data()
-    {
-        QTest::addColumn<QString>("option");
-        QTest::addColumn<QByteArray>("text"); // empty: a workbook for the desktop instead
-        // Tagged with the option's caption: the one the user picks by.
-        QTest::newRow("Text File") << u"Option4"_s << QByteArray("Ann Lee\r\nAnn Lee\r\n");
-        QTest::newRow("Excel (2 cells)") << u"Option5"_s << QByteArray();
-        QTest::newRow("Excel (1 cell)") << u"Option6"_s << QByteArray();
-    }
-
-    void savingFollowsTheChosenOutput()
-    {
-        QFETCH(QString, option);
-        QFETCH(QByteArray, text);
-        QCOMPARE(control<QAbstractButton>(results(), option)->text(),
-                 QString::fromUtf8(QTest::currentDataTag()));
-        click(option);
-        env->dialogs.answerSave(env->filePath(u"names.txt"_s));
-        click(u"PushButton2"_s);
-
-        QFile file(env->filePath(u"names.txt"_s));
-        QCOMPARE(file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray(), text);
-        QCOMPARE(env->shell.documents.size(), text.isEmpty() ? 1 : 0);
     }
 
     // The program's own names database, however the save dialog's answer
