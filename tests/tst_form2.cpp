@@ -1,6 +1,7 @@
 // "Start Generating" and the results window: the refusals as the user sees
 // them, the rows, "< Back", saving, and the window itself. The progress bar
-// and each output choice: tst_form1.
+// and each output choice: tst_form1; the pointer over its controls:
+// tst_routines.
 #include "app/form1.h"
 #include "app/form2.h"
 #include "support/controls.h"
@@ -139,29 +140,6 @@ private Q_SLOTS:
                  qPrintable(env->dialogs.messages().constFirst()));
         QCOMPARE(fileBytes(env->databasePath()), before);
         QVERIFY(QFileInfo(env->filePath(u"link.txt"_s)).isSymLink());
-    }
-
-    // The pointer a move over each control (the row's name) shows: the hand
-    // over the two buttons only.
-    void handOverTheButtonsOnly_data()
-    {
-        QTest::addColumn<int>("pointer");
-        QTest::newRow("PushButton2") << MousePointer::Custom;
-        QTest::newRow("PushButton8") << MousePointer::Custom;
-        QTest::newRow("Option4") << MousePointer::Default;
-        QTest::newRow("Frame2") << MousePointer::Default;
-    }
-
-    void handOverTheButtonsOnly()
-    {
-        QFETCH(int, pointer);
-        QWidget* w = control<QWidget>(results(), QString::fromLatin1(QTest::currentDataTag()));
-
-        // Start from the other pointer, so that the move has to change it.
-        results().pointer().setMousePointer(MousePointer::Custom + MousePointer::Default - pointer);
-        QMouseEvent move(QEvent::MouseMove, {}, {}, Qt::NoButton, Qt::NoButton, Qt::NoModifier);
-        QApplication::sendEvent(w, &move);
-        QCOMPARE(results().pointer().mousePointer(), pointer);
     }
 
     void closingTheResultsWindowEndsTheProgram()
