@@ -117,29 +117,17 @@ private Q_SLOTS:
         QCOMPARE(shownColumn(results(), u"ListView1"_s), QStringList(2, u"Ann"_s));
     }
 
-    // The program's own names database, however the save dialog's answer
-    // reaches it, is never replaced by the results: one error report.
-    void savingOverTheNamesDatabaseIsRefused_data()
-    {
-        QTest::addColumn<QString>("answer");
-        QTest::newRow("its path") << u"names.mdb"_s;
-        QTest::newRow("another way there") << u"sub/../names.mdb"_s;
-        QTest::newRow("a link to it") << u"link.txt"_s;
-    }
-
+    // The program's own names database is never replaced by the results: one
+    // error report. (The other ways of naming it: tst_saving.)
     void savingOverTheNamesDatabaseIsRefused()
     {
-        QFETCH(QString, answer);
-        QVERIFY(QDir(env->folder()).mkdir(u"sub"_s));
-        QVERIFY(QFile::link(env->databasePath(), env->filePath(u"link.txt"_s)));
         const QByteArray before = fileBytes(env->databasePath());
-        env->dialogs.answerSave(env->filePath(answer));
+        env->dialogs.answerSave(env->databasePath());
         click(u"PushButton2"_s);
         QCOMPARE(env->dialogs.messages().size(), 1);
         QVERIFY2(env->dialogs.messages().constFirst().contains(u"it is the names database"_s),
                  qPrintable(env->dialogs.messages().constFirst()));
         QCOMPARE(fileBytes(env->databasePath()), before);
-        QVERIFY(QFileInfo(env->filePath(u"link.txt"_s)).isSymLink());
     }
 
     void closingTheResultsWindowEndsTheProgram()
