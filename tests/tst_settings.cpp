@@ -3,9 +3,8 @@
 // cannot be written. (Booleans are written as text: the main window's
 // choices read them back.)
 #include "base/settings.h"
-#include "support/testenvironment.h"
+#include "support/program.h"
 
-#include <QProcess>
 #include <QTest>
 
 #include <cstdio>
@@ -124,11 +123,7 @@ private Q_SLOTS:
             QCOMPARE(::chmod(QFile::encodeName(path).constData(), mode_t(fileMode)), 0);
         QCOMPARE(::chmod(QFile::encodeName(folder.path()).constData(), mode_t(folderMode)), 0);
 
-        QProcess child;
-        child.start(QCoreApplication::applicationFilePath(),
-                    {u"--use-store-unprivileged"_s, folder.path()});
-        QVERIFY(child.waitForFinished(60000));
-        const QString output = QString::fromUtf8(child.readAllStandardOutput());
+        const QString output = runSelf({u"--use-store-unprivileged"_s, folder.path()});
         QFile::setPermissions(folder.path(),
                               QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
 
@@ -137,7 +132,7 @@ private Q_SLOTS:
                                    : u"Application Error!: The settings file %1 cannot be written: "
                                      "%2. Quillane goes on with your choices, but they will not be "
                                      "there at its next start."_s.arg(path, reason);
-        QCOMPARE(output, u"%1 8 %2\n"_s.arg(before, report));
+        QCOMPARE(output, u"%1 8 %2\nexit 0"_s.arg(before, report));
         const QFileInfo after(path);
         if (kind == u"file" && !reason.isEmpty())
             QCOMPARE(fileBytes(path), content);
@@ -161,7 +156,7 @@ namespace {
 // reads "Text1", writes it twice and prints what it read at start, what it
 // reads at the end, and each report shown, its title ending in "!" for the
 // exclamation mark.
-int useStoreUnprivileged(const char* folder)
+int useStoreUnprivileged(int&, char** argv)
 {
     if (::geteuid() == 0) {
         const passwd* nobody = ::getpwnam("nobody");
@@ -169,7 +164,7 @@ int useStoreUnprivileged(const char* folder)
             || ::setuid(nobody->pw_uid) != 0)
             return 3;
     }
-    QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, QString::fromLocal8Bit(folder));
+    QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, QString::fromLocal8Bit(argv[2]));
     FakeDialogs dialogs;
     Settings settings;
     settings.reportWriteFailuresTo(&dialogs);
@@ -189,12 +184,6 @@ int useStoreUnprivileged(const char* folder)
 
 } // namespace
 
-int main(int argc, char** argv)
-{
-    if (argc == 3 && qstrcmp(argv[1], "--use-store-unprivileged") == 0)
-        return useStoreUnprivileged(argv[2]);
-    QCoreApplication app(argc, argv);
-    TestSettings test;
-    return QTest::qExec(&test, argc, argv);
-}
+QUILLANE_TEST_MAIN_WITH_CHILD(TestSettings, "--use-store-unprivileged", useStoreUnprivileged)
+
 #include "tst_settings.moc"
