@@ -226,6 +226,16 @@ private Q_SLOTS:
         row("Load First Names", u"file=Nia,Ola PushButton6"_s,
             u"Adam Bo|Cleo Bo Nia Ola|Lee Moss|Zoe Al|Quill Rook"_s,
             u"Adam Bo Cleo Nia Ola|Lee Moss|0"_s);
+        // Names too long to store are reported, ten at most, the rest in one
+        // more report (its text: tst_import); the names that fit are stored
+        // all the same.
+        const QString overlong = QString(256, u'x') + u',';
+        const auto tooLong = [&](int n) -> QString {
+            return u"file="_s + overlong.repeated(n) + u"Nia PushButton6"_s;
+        };
+        const QString nia = u"Adam Bo|Cleo Bo Nia|Lee Moss|Zoe Al|Quill Rook"_s;
+        row("10 names too long", tooLong(10), nia, u"Adam Bo Cleo Nia|Lee Moss|10"_s);
+        row("12 names too long", tooLong(12), nia, u"Adam Bo Cleo Nia|Lee Moss|11"_s);
         row("Load Last Names", u"file=Nia PushButton7"_s,
             u"Adam Bo|Cleo Bo|Lee Moss Nia|Zoe Al|Quill Rook"_s, u"Adam Bo Cleo|Lee Moss Nia|0"_s);
         row("Load First Names, user", u"Option8 file=Nia PushButton6"_s,
@@ -329,39 +339,6 @@ private Q_SLOTS:
               "shown");
     }
 
-    void loadingReportsTenRejectedNamesAtMost_data()
-    {
-        QTest::addColumn<int>("overlong"); // names, before the one that fits
-        QTest::addColumn<QString>("more"); // the last report; empty: none
-        QTest::newRow("10") << 10 << QString();
-        QTest::newRow("11") << 11 << u"1 more names of this file were not stored."_s;
-    }
-
-    // Each name too long to store is reported, up to ten; the rest are
-    // counted in one report. The names that fit are stored all the same.
-    void loadingReportsTenRejectedNamesAtMost()
-    {
-        QFETCH(int, overlong);
-        QFETCH(QString, more);
-        TestEnvironment env(false);
-        fillAllTables(env);
-        const auto form = loadedForm1(env.environment);
-        const QString file = env.filePath(u"list.txt"_s);
-        writeBytes(file,
-                   (QStringList(overlong, QString(256, u'x')) << u"Nia"_s).join(u'\n').toUtf8());
-        env.dialogs.answerOpen({file});
-        control<QAbstractButton>(*form, u"PushButton6"_s)->click();
-        const QStringList messages = env.dialogs.messages();
-        const QString location = u"in Tessmark.Main.FileToListview "_s;
-        QCOMPARE(messages.size(), std::min(overlong, 10) + (more.isEmpty() ? 0 : 1));
-        for (int i = 0; i < std::min(overlong, 10); ++i)
-            QVERIFY(messages[i].endsWith(errorReportText({}, location, 50, ClosingLine::Long)));
-        if (!more.isEmpty())
-            QCOMPARE(messages.last(), errorReportText(more, location, 60, ClosingLine::Long));
-        QCOMPARE(allTables(env.databasePath()),
-                 u"Adam Bo|Cleo Bo Nia|Lee Moss|Zoe Al|Quill Rook"_s);
-    }
-
     void theBarDuringARun_data()
     {
         QTest::addColumn<int>("count");
@@ -369,12 +346,11 @@ private Q_SLOTS:
         QList<int> each(100);
         std::iota(each.begin(), each.end(), 1);
         QTest::newRow("none") << 0 << QList<int>{};
-        QTest::newRow("one") << 1 << QList<int>{100, 0};
-        QTest::newRow("two") << 2 << QList<int>{50, 100, 0};
         QTest::newRow("200: halves to even, each value once") << 200 << (each << 0);
     }
 
-    // The bar moves up to full, then goes back to empty for the next run.
+    // The bar moves up to full, then goes back to empty for the next run (the
+    // values for other counts: tst_generation).
     // The run holds the event loop, so each value is painted on the spot, in
     // turn; the closing empty bar is painted whenever the window is next.
     void theBarDuringARun()
