@@ -83,6 +83,8 @@ private Q_SLOTS:
 
         generate(count);
         QCOMPARE(env->dialogs.messages().join(u'\n'), message);
+        for (const FakeDialogs::Shown& shown : env->dialogs.shown) // plain, not an error report
+            QVERIFY(shown.title == u"Quillane"_s && shown.icon == MessageIcon::None);
         QTEST(shownColumn(results(), u"ListView1"_s), "firstNames");
         QCOMPARE(form->isVisible(), !message.isEmpty());
         QCOMPARE(results().isVisible(), message.isEmpty());
