@@ -1,6 +1,6 @@
 // The foundations that need no window: cursor files as read and written, the
-// desktop's shell as driven through stand-in xdg tools, a failure's text, and
-// the system clock.
+// desktop's shell opening documents and web pages as driven through stand-in
+// xdg tools, a failure's text, and the system clock.
 #include "base/clock.h"
 #include "base/cursorfile.h"
 #include "base/failure.h"
@@ -107,9 +107,12 @@ private Q_SLOTS:
             << writeCursorFile(largest, {255, 255}) << QStringList(256, u"#ffffffff"_s).join(u' ');
         QTest::newRow("PNG that does not decode") << cursorAround("\x89PNG\r\n") << QString();
         QTest::newRow("24-bit cut short") << cursorAround(bitmap(24).chopped(9)) << QString();
+        QTest::newRow("empty") << QByteArray() << QString();
         QTest::newRow("reserved word") << with(written, 0, 1) << QString();
+        QTest::newRow("an icon") << with(written, 2, 1) << QString();
         QTest::newRow("no pictures") << with(written, 4, 0) << QString();
         QTest::newRow("offset in the header") << with(written, 18, 21, 4) << QString();
+        QTest::newRow("offset past the end") << with(written, 18, 1000, 4) << QString();
         QTest::newRow("size past the end") << with(written, 14, 200, 4) << QString();
         QTest::newRow("not a bitmap header") << with(written, 22, 12, 4) << QString();
         QTest::newRow("bitmap header cut") << cursorAround(bitmap(32).left(39)) << QString();
@@ -137,46 +140,41 @@ private Q_SLOTS:
 
     void openingADocument_data()
     {
-        QTest::addColumn<QString>("file"); // what is opened, in a fresh folder
-        QTest::addColumn<QString>("mime"); // xdg-mime's answers; "kill": it crashes
+        QTest::addColumn<QString>("file"); // what is opened, in a fresh folder; or a web page
+        QTest::addColumn<QString>("mime"); // xdg-mime's answers; null: none, "kill": it crashes
         QTest::addColumn<QString>("entry");
         QTest::addColumn<QString>("installed"); // where the entry is; "-": no xdg-open
         QTest::addColumn<QString>("message");   // its start; empty: opened
+        const auto row = [](const char* tag, const QString& file, const QString& mime,
+                            const QString& entry, const QString& installed,
+                            const QString& message) {
+            QTest::newRow(tag) << file << mime << entry << installed << message;
+        };
+        const QString xlsx = u"a.xlsx"_s, sheet = u"text/x-sheet"_s,
+                      app = u"quill-sheets.desktop"_s;
+        const QString home = u"data/applications/"_s, none, ok; // ok: opened
         const QString missing = u"There is no program on this desktop that opens "_s;
-        const QString home = u"data/applications/"_s, system = u"system/applications/"_s;
-        QTest::newRow("opened") << u"a.xlsx"_s << u"text/x-sheet; charset=binary"_s
-                                << u"quill-sheets.desktop"_s << home + u"quill-sheets.desktop"_s
-                                << QString();
-        QTest::newRow("entry in a vendor folder")
-            << u"a.xlsx"_s << u"text/x-sheet"_s << u"quill-sheets.desktop"_s
-            << system + u"quill/sheets.desktop"_s << QString();
-        QTest::newRow("entry in a subfolder")
-            << u"a.xlsx"_s << u"text/x-sheet"_s << u"quill-sheets.desktop"_s
-            << home + u"more/quill-sheets.desktop"_s << QString();
-        QTest::newRow("entry starting with a dash")
-            << u"a.xlsx"_s << u"text/x-sheet"_s << u"-sheets.desktop"_s
-            << home + u"-sheets.desktop"_s << QString();
-        QTest::newRow("type from the name")
-            << u"a.txt"_s << u""_s << u""_s << u""_s << missing + u"txt files (text/plain)."_s;
-        QTest::newRow("no program for the type")
-            << u"a.xlsx"_s << u"text/x-sheet"_s << u""_s << u""_s
-            << missing + u"xlsx files (text/x-sheet)."_s;
-        QTest::newRow("program not installed")
-            << u"a.xlsx"_s << u"text/x-sheet"_s << u"quill-sheets.desktop"_s
-            << home + u"other.desktop"_s << missing + u"xlsx files (text/x-sheet)."_s;
-        QTest::newRow("xdg-mime crashes")
-            << u"a.xlsx"_s << u"kill"_s << u""_s << u""_s << u"xdg-mime gave no answer."_s;
-        QTest::newRow("no xdg-mime")
-            << u"a.xlsx"_s << QString() << u""_s << u""_s << u"xdg-mime could not be run ("_s;
-        QTest::newRow("no xdg-open")
-            << u"a.xlsx"_s << u"text/x-sheet"_s << u"quill-sheets.desktop"_s
-            << home + u"quill-sheets.desktop -"_s
-            << u"The program for text/x-sheet files could not be started."_s;
-        QTest::newRow("no file") << u""_s << u"text/x-sheet"_s << u""_s << u""_s << u"The file "_s;
+        const QString noSheets = missing + u"xlsx files (text/x-sheet)."_s;
+        row("opened", xlsx, sheet + u"; charset=binary"_s, app, home + app, ok);
+        row("entry in a vendor folder", xlsx, sheet, app,
+            u"system/applications/quill/sheets.desktop"_s, ok);
+        row("entry in a subfolder", xlsx, sheet, app, home + u"more/"_s + app, ok);
+        row("entry starting with a dash", xlsx, sheet, u"-s.desktop"_s, home + u"-s.desktop"_s, ok);
+        row("type from the name", u"a.txt"_s, u""_s, none, none,
+            missing + u"txt files (text/plain)."_s);
+        row("no program for the type", xlsx, sheet, none, none, noSheets);
+        row("program not installed", xlsx, sheet, app, home + u"other.desktop"_s, noSheets);
+        row("xdg-mime crashes", xlsx, u"kill"_s, none, none, u"xdg-mime gave no answer."_s);
+        row("no xdg-mime", xlsx, none, none, none, u"xdg-mime could not be run ("_s);
+        row("no xdg-open", xlsx, sheet, app, home + app + u" -"_s,
+            u"The program for text/x-sheet files could not be started."_s);
+        row("no file", u""_s, sheet, none, none, u"The file "_s);
+        row("a web page", u"https://quillane.org/?a=1&b=2"_s, none, none, none, ok);
     }
 
     // The desktop's association is asked first, so that a missing program is
-    // reported; xdg-open then gets the file's absolute path.
+    // reported; xdg-open then gets the file's absolute path, or the page's
+    // address as it is.
     void openingADocument()
     {
         QFETCH(QString, file);
@@ -202,13 +200,14 @@ private Q_SLOTS:
             tool(u"xdg-open"_s, u"echo \"$@\" > '%1'"_s.arg(opened));
         if (!installed.isEmpty())
             writeBytes(m_desktop.filePath(installed.section(u' ', 0, 0)), "[Desktop Entry]\n");
+        const bool page = file.startsWith(u"https:"_s);
         const QString path = m_desktop.filePath(file.isEmpty() ? u"gone.xlsx"_s : file);
-        if (!file.isEmpty())
+        if (!file.isEmpty() && !page)
             writeBytes(path, "names\n");
 
         QString failure;
         try {
-            DesktopShell().openDocument(path);
+            page ? DesktopShell().openWebPage(QUrl(file)) : DesktopShell().openDocument(path);
         } catch (const Failure& f) {
             failure = f.description();
         }
@@ -216,21 +215,9 @@ private Q_SLOTS:
                  qPrintable(failure));
         if (message.isEmpty())
             QTRY_COMPARE(QFile::exists(opened) ? fileBytes(opened) : QByteArray(),
-                         QFile::encodeName(path) + '\n');
+                         (page ? file.toUtf8() : QFile::encodeName(path)) + '\n');
         else
             QVERIFY(!QFile::exists(opened));
-    }
-
-    void openingAWebPage()
-    {
-        QDir(m_desktop.path()).removeRecursively();
-        qputenv("PATH", QFile::encodeName(m_desktop.filePath(u"bin"_s)));
-        tool(u"xdg-open"_s, u"echo \"$@\" > '%1'"_s.arg(m_desktop.filePath(u"opened"_s)));
-        DesktopShell().openWebPage(QUrl(u"https://quillane.org/?a=1&b=2"_s));
-        QTRY_COMPARE(QFile::exists(m_desktop.filePath(u"opened"_s))
-                         ? fileBytes(m_desktop.filePath(u"opened"_s))
-                         : QByteArray(),
-                     "https://quillane.org/?a=1&b=2\n");
     }
 
     // Caught as any exception, a failure gives its text in UTF-8.

@@ -1,5 +1,7 @@
 // "Start Generating" and the results window: the refusals as the user sees
-// them, the rows, the progress bar, "< Back", saving, and the window itself.
+// them, the rows, "< Back", saving, and the window itself. The progress bar
+// and each output choice: tst_form1; the pointer over its controls:
+// tst_routines.
 #include "app/form1.h"
 #include "app/form2.h"
 #include "support/controls.h"
@@ -15,7 +17,6 @@ class TestForm2 : public QObject {
 
     std::unique_ptr<TestEnvironment> env;
     std::unique_ptr<Form1> form;
-    QList<int> painted; // the values of the progress bar's paints
 
     // Types the count and presses "Start Generating".
     void generate(const QString& count)
@@ -25,13 +26,6 @@ class TestForm2 : public QObject {
     }
     Form2& results() { return *form->resultsWindow(); }
     void click(const QString& name) { control<QAbstractButton>(results(), name)->click(); }
-
-    bool eventFilter(QObject* watched, QEvent* event) override
-    {
-        if (event->type() == QEvent::Paint)
-            painted.append(qobject_cast<QProgressBar*>(watched)->value());
-        return false;
-    }
 
 private Q_SLOTS:
     // Every test starts from a first run of two rows of Ann Lee, the main
@@ -89,26 +83,12 @@ private Q_SLOTS:
 
         generate(count);
         QCOMPARE(env->dialogs.messages().join(u'\n'), message);
+        for (const FakeDialogs::Shown& shown : env->dialogs.shown) // plain, not an error report
+            QVERIFY(shown.title == u"Quillane"_s && shown.icon == MessageIcon::None);
         QTEST(shownColumn(results(), u"ListView1"_s), "firstNames");
         QCOMPARE(form->isVisible(), !message.isEmpty());
         QCOMPARE(results().isVisible(), message.isEmpty());
         QCOMPARE(form->pointer().mousePointer(), MousePointer::Default);
-    }
-
-    void barMovesDuringTheRunAndEndsAtZero()
-    {
-        click(u"PushButton8"_s);
-        auto* bar = control<QProgressBar>(*form, u"ProgressBar1"_s);
-        QApplication::processEvents();
-        bar->installEventFilter(this);
-        generate(u"300000"_s);
-
-        QCOMPARE(bar->value(), 0);
-        // Painted on the spot while the run held the event loop, once per
-        // shown value, 0 to 100 in turn; the window's ordinary paints after
-        // the run may add one or two.
-        for (int v = 0; v <= 100; ++v)
-            QCOMPARE(painted.value(v, -1), v);
     }
 
     // "< Back" only hides the window: the rows and the output choice stay,
@@ -139,77 +119,17 @@ private Q_SLOTS:
         QCOMPARE(shownColumn(results(), u"ListView1"_s), QStringList(2, u"Ann"_s));
     }
 
-    void savingFollowsTheChosenOutput_data()
-    {
-        QTest::addColumn<QString>("option");
-        QTest::addColumn<QByteArray>("text"); // empty: a workbook for the desktop instead
-        // Tagged with the option's caption: the one the user picks by.
-        QTest::newRow("Text File") << u"Option4"_s << QByteArray("Ann Lee\r\nAnn Lee\r\n");
-        QTest::newRow("Excel (2 cells)") << u"Option5"_s << QByteArray();
-        QTest::newRow("Excel (1 cell)") << u"Option6"_s << QByteArray();
-    }
-
-    void savingFollowsTheChosenOutput()
-    {
-        QFETCH(QString, option);
-        QFETCH(QByteArray, text);
-        QCOMPARE(control<QAbstractButton>(results(), option)->text(),
-                 QString::fromUtf8(QTest::currentDataTag()));
-        click(option);
-        env->dialogs.answerSave(env->filePath(u"names.txt"_s));
-        click(u"PushButton2"_s);
-
-        QFile file(env->filePath(u"names.txt"_s));
-        QCOMPARE(file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray(), text);
-        QCOMPARE(env->shell.documents.size(), text.isEmpty() ? 1 : 0);
-    }
-
-    // The program's own names database, however the save dialog's answer
-    // reaches it, is never replaced by the results: one error report.
-    void savingOverTheNamesDatabaseIsRefused_data()
-    {
-        QTest::addColumn<QString>("answer");
-        QTest::newRow("its path") << u"names.mdb"_s;
-        QTest::newRow("another way there") << u"sub/../names.mdb"_s;
-        QTest::newRow("a link to it") << u"link.txt"_s;
-    }
-
+    // The program's own names database is never replaced by the results: one
+    // error report. (The other ways of naming it: tst_saving.)
     void savingOverTheNamesDatabaseIsRefused()
     {
-        QFETCH(QString, answer);
-        QVERIFY(QDir(env->folder()).mkdir(u"sub"_s));
-        QVERIFY(QFile::link(env->databasePath(), env->filePath(u"link.txt"_s)));
         const QByteArray before = fileBytes(env->databasePath());
-        env->dialogs.answerSave(env->filePath(answer));
+        env->dialogs.answerSave(env->databasePath());
         click(u"PushButton2"_s);
         QCOMPARE(env->dialogs.messages().size(), 1);
         QVERIFY2(env->dialogs.messages().constFirst().contains(u"it is the names database"_s),
                  qPrintable(env->dialogs.messages().constFirst()));
         QCOMPARE(fileBytes(env->databasePath()), before);
-        QVERIFY(QFileInfo(env->filePath(u"link.txt"_s)).isSymLink());
-    }
-
-    // The pointer a move over each control (the row's name) shows: the hand
-    // over the two buttons only.
-    void handOverTheButtonsOnly_data()
-    {
-        QTest::addColumn<int>("pointer");
-        QTest::newRow("PushButton2") << MousePointer::Custom;
-        QTest::newRow("PushButton8") << MousePointer::Custom;
-        QTest::newRow("Option4") << MousePointer::Default;
-        QTest::newRow("Frame2") << MousePointer::Default;
-    }
-
-    void handOverTheButtonsOnly()
-    {
-        QFETCH(int, pointer);
-        QWidget* w = control<QWidget>(results(), QString::fromLatin1(QTest::currentDataTag()));
-
-        // Start from the other pointer, so that the move has to change it.
-        results().pointer().setMousePointer(MousePointer::Custom + MousePointer::Default - pointer);
-        QMouseEvent move(QEvent::MouseMove, {}, {}, Qt::NoButton, Qt::NoButton, Qt::NoModifier);
-        QApplication::sendEvent(w, &move);
-        QCOMPARE(results().pointer().mousePointer(), pointer);
     }
 
     void closingTheResultsWindowEndsTheProgram()

@@ -1,16 +1,17 @@
 // The settings store: the default rule, Booleans as the program reads them,
 // writes that reach the file at once, and stores that are malformed or
-// cannot be written.
+// cannot be written. (Booleans are written as text: the main window's
+// choices read them back.)
 #include "base/settings.h"
-#include "support/testenvironment.h"
+#include "support/program.h"
 
-#include <QProcess>
 #include <QTest>
 
 #include <cstdio>
 
 #include <grp.h>
 #include <pwd.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 using namespace Qt::StringLiterals;
@@ -20,20 +21,6 @@ class TestSettings : public QObject {
 
 private Q_SLOTS:
     void init() { useTemporarySettings(); }
-
-    // Booleans are written as text.
-    void writesReachTheFileAtOnce()
-    {
-        Settings settings;
-        settings.write(u"Text1"_s, u"250"_s);
-        settings.writeBool(u"Option1"_s, true);
-        settings.writeBool(u"Option2"_s, false);
-        QVERIFY(settings.fileName().endsWith(u"Varnholt.ini"_s));
-        const QByteArray content = fileBytes(settings.fileName());
-        for (const char* line :
-             {"[Quillane]\n", "Text1=250\n", "Option1=True\n", "Option2=False\n"})
-            QVERIFY2(content.contains(line), line);
-    }
 
     void storedValues_data()
     {
@@ -113,7 +100,8 @@ private Q_SLOTS:
     // written is reported once, at the first write, and the values written
     // hold in memory; the file is left as it was. A malformed file reads as
     // the keys it holds, and the next write leaves a well-formed file that
-    // keeps every key it held.
+    // keeps every key it held. The child ends without closing the store, so
+    // what the file holds reached it at the write.
     void damagedOrUnwritableStore()
     {
         QFETCH(QString, kind);
@@ -130,24 +118,21 @@ private Q_SLOTS:
             QVERIFY(QDir(folder.path()).mkdir(u"Varnholt.ini"_s));
         else if (kind == u"link")
             QVERIFY(QFile::link(u"missing/Varnholt.ini"_s, path));
+        // Owner, group and others alike: the child may be any of them.
         if (kind == u"file")
-            QVERIFY(QFile::setPermissions(path, QFile::Permissions(permissions(fileMode))));
-        QVERIFY(QFile::setPermissions(folder.path(), QFile::Permissions(permissions(folderMode))));
+            QCOMPARE(::chmod(QFile::encodeName(path).constData(), mode_t(fileMode)), 0);
+        QCOMPARE(::chmod(QFile::encodeName(folder.path()).constData(), mode_t(folderMode)), 0);
 
-        QProcess child;
-        child.start(QCoreApplication::applicationFilePath(),
-                    {u"--use-store-unprivileged"_s, folder.path()});
-        QVERIFY(child.waitForFinished(60000));
-        const QString output = QString::fromUtf8(child.readAllStandardOutput());
+        const QString output = runSelf({u"--use-store-unprivileged"_s, folder.path()});
         QFile::setPermissions(folder.path(),
                               QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
 
         const QString report = reason.isEmpty()
                                    ? QString()
-                                   : u"Application Error: The settings file %1 cannot be written: "
+                                   : u"Application Error!: The settings file %1 cannot be written: "
                                      "%2. Quillane goes on with your choices, but they will not be "
                                      "there at its next start."_s.arg(path, reason);
-        QCOMPARE(output, u"%1 8 %2\n"_s.arg(before, report));
+        QCOMPARE(output, u"%1 8 %2\nexit 0"_s.arg(before, report));
         const QFileInfo after(path);
         if (kind == u"file" && !reason.isEmpty())
             QCOMPARE(fileBytes(path), content);
@@ -163,29 +148,15 @@ private Q_SLOTS:
                 QVERIFY2(written.contains(line), written.constData());
         }
     }
-
-private:
-    static QFileDevice::Permissions permissions(int mode)
-    {
-        // Owner, group and others alike: the child may be any of them.
-        QFileDevice::Permissions result;
-        const QFileDevice::Permission bits[] = {
-            QFile::ExeOther, QFile::WriteOther, QFile::ReadOther,
-            QFile::ExeGroup, QFile::WriteGroup, QFile::ReadGroup,
-            QFile::ExeOwner, QFile::WriteOwner, QFile::ReadOwner};
-        for (int bit = 0; bit < 9; ++bit)
-            if (mode & (1 << bit))
-                result |= bits[bit];
-        return result;
-    }
 };
 
 namespace {
 
 // The child of damagedOrUnwritableStore, as nobody when started as root:
 // reads "Text1", writes it twice and prints what it read at start, what it
-// reads at the end, and each report shown.
-int useStoreUnprivileged(const char* folder)
+// reads at the end, and each report shown, its title ending in "!" for the
+// exclamation mark.
+int useStoreUnprivileged(int&, char** argv)
 {
     if (::geteuid() == 0) {
         const passwd* nobody = ::getpwnam("nobody");
@@ -193,7 +164,7 @@ int useStoreUnprivileged(const char* folder)
             || ::setuid(nobody->pw_uid) != 0)
             return 3;
     }
-    QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, QString::fromLocal8Bit(folder));
+    QSettings::setPath(QSettings::IniFormat, QSettings::UserScope, QString::fromLocal8Bit(argv[2]));
     FakeDialogs dialogs;
     Settings settings;
     settings.reportWriteFailuresTo(&dialogs);
@@ -202,20 +173,17 @@ int useStoreUnprivileged(const char* folder)
     settings.write(u"Text1"_s, u"8"_s);
     QStringList reports;
     for (const FakeDialogs::Shown& shown : dialogs.shown)
-        reports << shown.title + u": "_s + shown.text;
+        reports << shown.title + (shown.icon == MessageIcon::Exclamation ? u"!: "_s : u": "_s)
+                       + shown.text;
     std::printf("%s %s %s\n", qUtf8Printable(before), qUtf8Printable(settings.read(u"Text1"_s, {})),
                 qUtf8Printable(reports.join(u'|')));
-    return 0;
+    // Ended without the store's destructor: what is in the file was written at once.
+    std::fflush(stdout);
+    ::_exit(0);
 }
 
 } // namespace
 
-int main(int argc, char** argv)
-{
-    if (argc == 3 && qstrcmp(argv[1], "--use-store-unprivileged") == 0)
-        return useStoreUnprivileged(argv[2]);
-    QCoreApplication app(argc, argv);
-    TestSettings test;
-    return QTest::qExec(&test, argc, argv);
-}
+QUILLANE_TEST_MAIN_WITH_CHILD(TestSettings, "--use-store-unprivileged", useStoreUnprivileged)
+
 #include "tst_settings.moc"

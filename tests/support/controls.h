@@ -24,8 +24,3 @@ inline QStringList shownColumn(QWidget& window, const QString& view, int column 
     return texts;
 }
 
-// How many rows a list view shows.
-inline int shownRowCount(QWidget& window, const QString& view)
-{
-    return control<QAbstractItemView>(window, view)->model()->rowCount();
-}
