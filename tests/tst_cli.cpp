@@ -216,6 +216,8 @@ private Q_SLOTS:
         row("seed with a plus", "generate -n 3 --seed +1", 2, "--seed takes a whole number from 0");
         row("shard not I/N", "generate -n 3 --shard half", 2, "--shard takes I/N");
         row("shard zero", "generate -n 3 --shard 0/2", 2, "--shard takes I/N");
+        row("threads not a number", "generate -n 3 --threads x", 2,
+            "--threads takes a whole number from 1 to 1024, not 'x'.");
         row("threads beyond the most", "generate -n 3 --threads 1025", 2,
             "--threads takes a whole number from 1 to 1024, not '1025'.");
         row("format unknown", "generate -n 3 --format pdf", 2,
@@ -270,6 +272,7 @@ private Q_SLOTS:
             "^(\\S+ \\S+\\n){2}\\z");
         // Beyond the window's bound, rounded: 1001 statements, the last of one.
         row("1000000.6", "generate -n 1000000.6 --format sql", 0, "VALUES\\n\\([^\\n]*\\);\\n\\z");
+        row("--gender both", "generate -n 2 --gender both", 0, "^(\\S+ \\S+\\n){2}\\z");
         row("--count=", "generate --count=2", 0, "^(\\S+ \\S+\\n){2}\\z");
         row("-n=", "generate -n=2", 0, "^(\\S+ \\S+\\n){2}\\z");
         row("-o -", "generate -n 2 -o -", 0, "^(\\S+ \\S+\\n){2}\\z");

@@ -410,7 +410,8 @@ GenerateRequest Command::readGenerate()
         bool ok = false;
         const QString text = value(u"seed"_s);
         const qulonglong seed = text.toULongLong(&ok);
-        if (!ok || text.startsWith(u'-') || text.startsWith(u'+'))
+        // The conversion refuses a minus sign but takes a plus.
+        if (!ok || text.startsWith(u'+'))
             usage(u"--seed takes a whole number from 0 to 18446744073709551615, not '%1'."_s.arg(
                       text),
                   m_name);
