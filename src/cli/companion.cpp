@@ -122,8 +122,9 @@ Options:
                        format a FILE ending in .csv, .tsv, .jsonl, .sql or
                        .xlsx (xlsx2) names, else text.
   --table NAME         the table the sql format inserts into (default: people)
-  -o, --output FILE    write to FILE instead of standard output; an existing
-                       FILE is replaced only once the new one is complete
+  -o, --output FILE    write to FILE instead of standard output ('-'); an
+                       existing FILE is replaced only once the new one is
+                       complete
   --database FILE      the names database
 )"},
     {u"names"_s, R"(Usage: quillane-cli names first|last [OPTIONS]
