@@ -14,6 +14,7 @@
 #include <QLineEdit>
 #include <QPushButton>
 #include <QRadioButton>
+#include <QRegularExpression>
 #include <QStandardPaths>
 #include <QTableView>
 
@@ -36,12 +37,18 @@ struct Run {
 
 const QString Cli = QStringLiteral(QUILLANE_CLI);
 
-// Runs quillane-cli with the arguments, in the user's number format locale.
-Run cli(const QStringList& arguments, const QString& locale = u"C.UTF-8"_s)
+// Runs quillane-cli with the arguments as a shell would take them: a first
+// LC_ALL=LOCALE is the user's number format (else C), a last >FILE receives
+// standard output.
+Run cli(QStringList arguments)
 {
     QProcess process;
     QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
-    environment.insert(u"LC_ALL"_s, locale);
+    environment.insert(u"LC_ALL"_s, arguments.value(0).startsWith(u"LC_ALL=")
+                                        ? arguments.takeFirst().mid(7)
+                                        : u"C.UTF-8"_s);
+    if (arguments.value(arguments.size() - 1).startsWith(u'>'))
+        process.setStandardOutputFile(arguments.takeLast().mid(1));
     process.setProcessEnvironment(environment);
     process.start(Cli, arguments);
     process.waitForFinished(60000);
@@ -93,6 +100,12 @@ QList<QStringList> readBack(const QByteArray& printed)
     return rows;
 }
 
+// A row of commandLines, its command line split at spaces.
+void row(const char* tag, const char* line, int status, const char* said)
+{
+    QTest::newRow(tag) << QString::fromUtf8(line).split(u' ') << status << QString::fromUtf8(said);
+}
+
 QStringList lines(const QByteArray& bytes)
 {
     return QString::fromUtf8(bytes).split(u'\n', Qt::SkipEmptyParts);
@@ -113,12 +126,14 @@ class TestCli : public QObject {
     QString db; // the copy of the shipped database every run works on
     QString output() const { return env->filePath(u"out.txt"_s); }
 
-    // Runs the companion on the test's database.
-    Run run(QStringList arguments, const QString& locale = u"C.UTF-8"_s)
+    // Runs the companion on the test's database, unless it names one.
+    Run run(QStringList arguments)
     {
-        if (!arguments.isEmpty() && arguments.first() != u"--database")
+        if (!arguments.isEmpty() && std::ranges::none_of(arguments, [](const QString& argument) {
+                return argument.startsWith(u"--database");
+            }))
             arguments.insert(1, u"--database=%1"_s.arg(db));
-        return cli(arguments, locale);
+        return cli(arguments);
     }
 
 private Q_SLOTS:
@@ -128,162 +143,201 @@ private Q_SLOTS:
         db = env->databasePath();
     }
 
-    // Every way a command line can go wrong: one line on standard error
-    // (ending in the way to the help for a usage error), nothing on standard
-    // output, and neither the database nor an existing output file touched.
-    void badInputChangesNothing_data()
+    // Every rule of the command line, one row each: a failure is one line on
+    // standard error (ending in the way to the help for a usage error) and
+    // nothing written; a success writes nothing there. Either way the
+    // database and an existing output file are untouched. The rows tagged
+    // "locked" run while another connection holds the database.
+    void commandLines_data()
     {
-        QTest::addColumn<QStringList>("arguments");
+        QTest::addColumn<QStringList>("arguments"); // %1 the test's folder
         QTest::addColumn<int>("status");
-        QTest::addColumn<QString>("error"); // the first line, %1 the test's folder
+        // A failure: the start of its line after "quillane-cli: ". A success:
+        // a pattern for all it wrote, to standard output and to a new file.
+        QTest::addColumn<QString>("said");
         const QString tooLong(256, u'x');
-        QTest::newRow("no command") << QStringList{} << 2 << u"quillane-cli: Give a command."_s;
-        QTest::newRow("unknown command")
-            << QStringList{u"make"_s} << 2 << u"quillane-cli: 'make' is not a command."_s;
-        QTest::newRow("unknown option") << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--fast"_s}
-                                        << 2 << u"quillane-cli: Unknown option 'fast'."_s;
-        QTest::newRow("no count") << QStringList{u"generate"_s} << 2
-                                  << u"quillane-cli: How many? Give -n COUNT."_s;
-        QTest::newRow("count not a number")
-            << QStringList{u"generate"_s, u"-n"_s, u"ten"_s} << 2
-            << u"quillane-cli: How many does not appear to be a number."_s;
-        QTest::newRow("count below zero")
-            << QStringList{u"generate"_s, u"-n"_s, u"-5"_s} << 2
-            << u"quillane-cli: -n takes a count of 0 or more, not '-5'."_s;
-        QTest::newRow("count far below zero")
-            << QStringList{u"generate"_s, u"-n"_s, u"-1e308"_s} << 2
-            << u"quillane-cli: -n takes a count of 0 or more, not '-1e308'."_s;
-        QTest::newRow("count beyond 64 bits")
-            << QStringList{u"generate"_s, u"-n"_s, u"1e19"_s} << 2
-            << u"quillane-cli: -n takes at most 9223372036854775807 names, not '1e19'."_s;
-        QTest::newRow("more rows than a sheet holds")
-            << QStringList{u"generate"_s, u"--count"_s, u"1048577"_s, u"-o"_s, u"%1/out.xlsx"_s}
-            << 2 << u"quillane-cli: A worksheet holds at most 1048576 rows"_s;
-        QTest::newRow("a workbook in shards")
-            << QStringList{u"generate"_s, u"-n"_s, u"3"_s,          u"--shard"_s,
-                           u"1/2"_s,      u"-o"_s, u"%1/out.xlsx"_s}
-            << 2 << u"quillane-cli: A workbook is one file: it cannot be made in shards."_s;
-        QTest::newRow("shard beyond the shards")
-            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--shard"_s, u"3/2"_s} << 2
-            << u"quillane-cli: --shard takes I/N, part I of N, with 1 <= I <= N, not '3/2'."_s;
-        QTest::newRow("no threads")
-            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--threads"_s, u"0"_s} << 2
-            << u"quillane-cli: --threads takes a whole number from 1 to 1024, not '0'."_s;
-        QTest::newRow("a table for csv")
-            << QStringList{u"generate"_s, u"-n"_s,       u"3"_s,  u"--table"_s,
-                           u"t"_s,        u"--format"_s, u"csv"_s}
-            << 2 << u"quillane-cli: --table names the table of the sql format."_s;
-        QTest::newRow("workbook to standard output")
-            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--format"_s, u"xlsx1"_s} << 2
-            << u"quillane-cli: A workbook is written to a file: give -o FILE."_s;
-        QTest::newRow("gender of the user list")
-            << QStringList{u"names"_s, u"first"_s, u"--list"_s, u"user"_s, u"--gender"_s, u"male"_s}
-            << 2
-            << u"quillane-cli: --gender chooses among the built-in first names; your own list "
-               u"has no genders."_s;
-        QTest::newRow("delete from the user list")
-            << QStringList{u"delete"_s, u"first"_s, u"Ann"_s, u"--list"_s, u"user"_s} << 2
-            << u"quillane-cli: Your own list is emptied as a whole: use 'quillane-cli clear'."_s;
-        QTest::newRow("output over the database")
-            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"-o"_s, u"%1/./names.mdb"_s} << 2
-            << u"quillane-cli: -o %1/./names.mdb would replace the names database."_s;
-        QTest::newRow("empty user list")
-            << QStringList{u"generate"_s, u"-n"_s, u"3"_s,         u"--list"_s,
-                           u"user"_s,     u"-o"_s, u"%1/out.txt"_s}
-            << 1 << u"quillane-cli: You must add a first name"_s;
-        QTest::newRow("output is a folder")
-            << QStringList{u"generate"_s, u"-n"_s, u"3"_s, u"--format"_s,
-                           u"xlsx2"_s,    u"-o"_s, u"%1"_s}
-            << 1 << u"quillane-cli: The file %1 could not be saved: Is a directory"_s;
+        QTest::newRow("no command") << QStringList{} << 2 << u"Give a command."_s;
+        row("unknown command", "make", 2, "'make' is not a command.");
+        row("--help before an unknown command", "--help make", 2, "'make' is not a command.");
+        row("unknown option", "generate -n 3 --fast", 2, "Unknown option '--fast'.");
+        row("unknown letter", "generate -n 3 -x", 2, "Unknown option '-x'.");
+        row("unknown option before the command", "--fast names last", 2,
+            "Unknown option '--fast'.");
+        row("an option without its value", "generate -n 3 --format", 2,
+            "Missing value after '--format'.");
+        row("--database without its file", "--database", 2, "Missing value after '--database'.");
+        row("a value for a switch", "generate -n 3 --unique=yes", 2,
+            "Unexpected value after '--unique'.");
+        row("stray argument", "generate -n 3 stray", 2, "Unexpected argument 'stray'.");
+        row("the first stray is named", "names first last extra", 2, "Unexpected argument 'last'.");
+        row("stray argument to clear", "clear last first", 2, "Unexpected argument 'first'.");
+        row("stray argument with --help", "generate --help extra", 2,
+            "Unexpected argument 'extra'.");
+        row("stray argument with --version", "--version extra", 2, "Unexpected argument 'extra'.");
+        row("too few arguments", "add first", 2, "Too few arguments.");
+        row("neither first nor last", "names First", 2, "Say 'first' or 'last', not 'First'.");
+        row("count repeated", "generate -n 3 --count=4", 2, "--count is given more than once.");
+        row("switch repeated", "generate -n 3 --unique --unique", 2,
+            "--unique is given more than once.");
+        row("--database before and after the command",
+            "--database=%1/names.mdb generate -n 3 --database %1/names.mdb", 2,
+            "--database is given more than once.");
+        row("--database repeated before the command",
+            "--database=%1/names.mdb --database %1/names.mdb names last", 2,
+            "--database is given more than once.");
+        row("--help repeated", "-h --help", 2, "--help is given more than once.");
+        row("--version repeated", "--version --version", 2, "--version is given more than once.");
+        row("--database empty", "--database= names last", 2, "--database needs a file name.");
+        row("--database empty after the command", "names last --database=", 2,
+            "--database needs a file name.");
+        row("-o empty", "generate -n 3 -o=", 2,
+            "-o needs a file name, or '-' for standard output.");
+        row("no count", "generate", 2, "How many? Give -n COUNT.");
+        row("count not a number", "generate -n ten", 2, "How many does not appear to be a number.");
+        row("count below zero", "generate -n -5", 2, "-n takes a count of 0 or more, not '-5'.");
+        row("count far below zero", "generate -n -1e308", 2,
+            "-n takes a count of 0 or more, not '-1e308'.");
+        row("count beyond 64 bits", "generate -n 1e19", 2,
+            "-n takes at most 9223372036854775807 names, not '1e19'.");
+        row("more rows than a sheet holds", "generate --count 1048577 -o %1/out.xlsx", 2,
+            "A worksheet holds at most 1048576 rows");
+        row("a workbook in shards", "generate -n 3 --shard 1/2 -o %1/out.xlsx", 2,
+            "A workbook is one file: it cannot be made in shards.");
+        row("shard beyond the shards", "generate -n 3 --shard 3/2", 2,
+            "--shard takes I/N, part I of N, with 1 <= I <= N, not '3/2'.");
+        row("no threads", "generate -n 3 --threads 0", 2,
+            "--threads takes a whole number from 1 to 1024, not '0'.");
+        row("list unknown", "names last --list mine", 2,
+            "--list is 'builtin' or 'user', not 'mine'.");
+        row("gender unknown", "names first --gender all", 2,
+            "--gender is 'both', 'male' or 'female', not 'all'.");
+        row("seed not a number", "generate -n 3 --seed x", 2, "--seed takes a whole number from 0");
+        row("seed below zero", "generate -n 3 --seed -1", 2, "--seed takes a whole number from 0");
+        row("seed with a plus", "generate -n 3 --seed +1", 2, "--seed takes a whole number from 0");
+        row("shard not I/N", "generate -n 3 --shard half", 2, "--shard takes I/N");
+        row("shard zero", "generate -n 3 --shard 0/2", 2, "--shard takes I/N");
+        row("threads not a number", "generate -n 3 --threads x", 2,
+            "--threads takes a whole number from 1 to 1024, not 'x'.");
+        row("threads beyond the most", "generate -n 3 --threads 1025", 2,
+            "--threads takes a whole number from 1 to 1024, not '1025'.");
+        row("format unknown", "generate -n 3 --format pdf", 2,
+            "--format is text, lines, csv, tsv, jsonl, sql, xlsx2 or xlsx1, not 'pdf'.");
+        row("table empty", "generate -n 3 --format sql --table=", 2, "--table needs a name.");
+        row("a table for a workbook", "generate -n 3 -o %1/out.xlsx --table t", 2,
+            "--table names the table of the sql format.");
+        row("a table for csv", "generate -n 3 --table t --format csv", 2,
+            "--table names the table of the sql format.");
+        row("workbook to standard output", "generate -n 3 --format xlsx1", 2,
+            "A workbook is written to a file: give -o FILE.");
+        row("gender of the user list", "names first --list user --gender male", 2,
+            "--gender chooses among the built-in first names; your own list has no genders.");
+        row("delete from the user list", "delete first Ann --list user", 2,
+            "Your own list is emptied as a whole: use 'quillane-cli clear'.");
+        row("output over the database", "generate -n 3 -o %1/./names.mdb", 2,
+            "-o %1/./names.mdb would replace the names database.");
+        row("missing database", "--database=%1/none.mdb names last", 1,
+            "%1/none.mdb: unable to open database file");
+        row("not a database", "names last --database %1/good.txt", 1,
+            "The file %1/good.txt is not a Quillane names database.");
+        row("locked, reading", "generate -n 3", 1, "%1/names.mdb: database is locked");
+        row("locked, adding", "add first Zed", 1, "%1/names.mdb: database is locked");
+        row("empty user list", "generate -n 3 --list user -o %1/out.txt", 1,
+            "You must add a first name");
+        row("output is a folder", "generate -n 3 --format xlsx2 -o %1", 1,
+            "The file %1 could not be saved: Is a directory");
         QTest::newRow("blank name") << QStringList{u"add"_s, u"first"_s, u"Ann"_s, u"  "_s} << 1
-                                    << u"quillane-cli: The name \"  \" is blank: nothing was "
-                                       u"added."_s;
+                                    << u"The name \"  \" is blank: nothing was added."_s;
         QTest::newRow("name too long")
             << QStringList{u"add"_s, u"last"_s, u"Lee"_s, tooLong} << 1
-            << u"quillane-cli: The name \"%1...\" is longer than 255 characters and was not "
-               u"stored."_s.arg(tooLong.left(40));
-        QTest::newRow("control character")
-            << QStringList{u"add"_s, u"last"_s, u"Lee"_s, u"Evil\nInjected"_s} << 1
-            << u"quillane-cli: The name \"Evil\\nInjected\" holds a control character and was "
-               u"not stored."_s;
-        QTest::newRow("a file that is not text")
-            << QStringList{u"import"_s, u"last"_s, u"%1/good.txt"_s, u"%1/names.mdb"_s} << 1
-            << u"quillane-cli: The file %1/names.mdb is not text: it holds control characters. "
-               u"Nothing of it was stored."_s;
-        QTest::newRow("name not in the list")
-            << QStringList{u"delete"_s, u"last"_s, u"SMITH"_s, u"Quillonne"_s} << 1
-            << u"quillane-cli: \"Quillonne\" is not in the list: nothing was deleted."_s;
-        QTest::newRow("file not found") << QStringList{u"import"_s, u"first"_s, u"%1/none.txt"_s}
-                                        << 1 << u"quillane-cli: File not found: %1/none.txt"_s;
+            << u"The name \"%1...\" is longer than 255 characters and was not stored."_s.arg(
+                   tooLong.left(40));
+        row("control character", "add last Lee Evil\nInjected", 1,
+            "The name \"Evil\\nInjected\" holds a control character and was not stored.");
+        row("a file that is not text", "import last %1/good.txt %1/names.mdb", 1,
+            "The file %1/names.mdb is not text: it holds control characters. Nothing of it was "
+            "stored.");
+        row("name not in the list", "delete last SMITH Quillonne", 1,
+            "\"Quillonne\" is not in the list: nothing was deleted.");
+        row("file not found", "import first %1/none.txt", 1, "File not found: %1/none.txt");
         QTest::newRow("a rejected name in the second file")
             << QStringList{u"import"_s, u"last"_s, u"%1/good.txt"_s, u"%1/bad.txt"_s} << 1
-            << u"quillane-cli: %1/bad.txt: The name \"%2...\" is longer than 255 characters "
-               u"and was not stored. Nothing was imported."_s.arg(u"%1"_s, tooLong.left(40));
+            << u"%1/bad.txt: The name \"%2...\" is longer than 255 characters and was not stored. "
+               u"Nothing was imported."_s.arg(u"%1"_s, tooLong.left(40));
+        row("a full standard output", "names last >/dev/full", 1,
+            "standard output: No space left on device");
+        row("a full standard output, on threads", "generate -n 3000000 --threads 4 >/dev/full", 1,
+            "standard output: No space left on device");
+        row("none", "generate -n 0", 0, "^\\z");
+        row("a decimal comma, to even", "LC_ALL=de_DE.UTF-8 generate -n 2,5", 0,
+            "^(\\S+ \\S+\\n){2}\\z");
+        // Beyond the window's bound, rounded: 1001 statements, the last of one.
+        row("1000000.6", "generate -n 1000000.6 --format sql", 0, "VALUES\\n\\([^\\n]*\\);\\n\\z");
+        row("--gender both", "generate -n 2 --gender both", 0, "^(\\S+ \\S+\\n){2}\\z");
+        row("--count=", "generate --count=2", 0, "^(\\S+ \\S+\\n){2}\\z");
+        row("-n=", "generate -n=2", 0, "^(\\S+ \\S+\\n){2}\\z");
+        row("-o -", "generate -n 2 -o -", 0, "^(\\S+ \\S+\\n){2}\\z");
+        row(".CSV", "generate -n 2 -o=%1/o.CSV", 0,
+            "^first_name,last_name\\r\\n(\\S+,\\S+\\r\\n){2}\\z");
+        row(".Tsv", "generate -n 2 --output=%1/o.Tsv", 0,
+            "^first_name\\tlast_name\\n(\\S+\\t\\S+\\n){2}\\z");
+        row(".JSONL", "generate -n 2 -o %1/o.JSONL", 0,
+            "^(\\{\"first_name\":\"\\S+\",\"last_name\":\"\\S+\"\\}\\n){2}\\z");
+        row(".Sql", "generate -n 2 -o%1/o.Sql", 0,
+            "^INSERT INTO people \\(first_name, last_name\\) VALUES\\n");
+        row(".XLSX", "generate -n 2 -o %1/o.XLSX", 0, "^PK\\x03\\x04");
+        row("any other ending", "generate -n 2 -o %1/o.lst", 0, "^(\\S+ \\S+\\r\\n){2}\\z");
+        row("--help", "--help", 0, "^Usage: quillane-cli \\[--database FILE\\] COMMAND");
+        row("--version", "--version", 0, "^quillane-cli \\d+\\.\\d+\\.\\d+\\nnames database: %1/");
+        row("--help before a command", "--help generate", 0, "^Usage: quillane-cli generate ");
+        row("help while typing", "add first -h", 0, "^Usage: quillane-cli add ");
+        for (const char* command : {"generate", "names", "add", "delete", "clear", "import"}) {
+            QTest::addRow("%s --help", command)
+                << QStringList{QString::fromUtf8(command), u"--help"_s} << 0
+                << u"^Usage: quillane-cli %1 "_s.arg(QString::fromUtf8(command));
+        }
     }
 
-    void badInputChangesNothing()
+    void commandLines()
     {
         QFETCH(QStringList, arguments);
         QFETCH(int, status);
-        QFETCH(QString, error);
+        QFETCH(QString, said);
         const QString folder = env->folder();
         writeBytes(env->filePath(u"good.txt"_s), "Quill\nStone\n");
         writeBytes(env->filePath(u"bad.txt"_s), "Reed\n" + QByteArray(256, 'x') + "\n");
         writeBytes(output(), "keep me\r\n");
         const QByteArray before = fileBytes(db);
-        for (QString& argument : arguments)
-            argument = argument.replace(u"%1"_s, folder);
-
-        const Run result = run(arguments);
-        QCOMPARE(result.status, status);
-        QVERIFY2(result.out.isEmpty(), result.out.constData());
-        const QStringList said = lines(result.err);
-        QCOMPARE(said.size(), 1);
-        QVERIFY2(said.first().startsWith(error.replace(u"%1"_s, folder)), result.err.constData());
-        QCOMPARE(said.first().contains(u" Try 'quillane-cli "_s), status == 2);
-        QCOMPARE(fileBytes(db), before);
-        QCOMPARE(fileBytes(output()), QByteArray("keep me\r\n"));
-        QCOMPARE(QDir(folder).entryList(QDir::Files | QDir::Hidden).size(), 4);
-    }
-
-    // A missing, a corrupt and a locked database: one line, status 1.
-    void databaseFailures_data()
-    {
-        QTest::addColumn<QString>("problem");
-        QTest::addColumn<QStringList>("arguments");
-        QTest::addColumn<QString>("error");
-        const QStringList generate{u"generate"_s, u"-n"_s, u"3"_s};
-        QTest::newRow("missing") << u"missing"_s << generate
-                                 << u"%1: unable to open database file"_s;
-        QTest::newRow("not a database") << u"corrupt"_s << QStringList{u"names"_s, u"last"_s}
-                                        << u"The file %1 is not a Quillane names database."_s;
-        QTest::newRow("locked, reading") << u"locked"_s << generate << u"%1: database is locked"_s;
-        QTest::newRow("locked, adding")
-            << u"locked"_s << QStringList{u"add"_s, u"first"_s, u"Zed"_s}
-            << u"%1: database is locked"_s;
-    }
-
-    void databaseFailures()
-    {
-        QFETCH(QString, problem);
-        QFETCH(QStringList, arguments);
-        QFETCH(QString, error);
+        const QStringList files = QDir(folder).entryList(QDir::Files | QDir::Hidden);
         std::optional<Connection> lock;
-        if (problem == u"missing")
-            QVERIFY(QFile::remove(db));
-        else if (problem == u"corrupt")
-            writeBytes(db, QByteArray(4096, 'q'));
-        else {
+        if (QByteArray(QTest::currentDataTag()).startsWith("locked")) {
             lock.emplace(db);
             lock->execute("begin exclusive");
         }
-        const Run result = run(arguments);
-        QCOMPARE(result.status, 1);
-        QVERIFY(result.out.isEmpty());
-        QCOMPARE(QString::fromUtf8(result.err), u"quillane-cli: %1\n"_s.arg(error.arg(db)));
+        const Run result = run(arguments.replaceInStrings(u"%1"_s, folder));
         lock.reset();
-        if (problem == u"locked")
-            QCOMPARE(tableColumn(db, u"system_ffirstname"_s, u"Ffirst"_s).count(u"Zed"_s), 0);
+        QByteArray wrote = result.out;
+        for (const QString& name : QDir(folder).entryList(QDir::Files | QDir::Hidden)) {
+            if (!files.contains(name))
+                wrote += fileBytes(env->filePath(name));
+        }
+        QCOMPARE(result.status, status);
+        if (status == 0) {
+            QCOMPARE(result.err, QByteArray());
+            const QRegularExpression pattern(
+                said.replace(u"%1"_s, QRegularExpression::escape(folder)));
+            QVERIFY2(pattern.match(QString::fromLatin1(wrote)).hasMatch(),
+                     wrote.left(300).constData());
+        } else {
+            QVERIFY2(wrote.isEmpty(), wrote.constData());
+            const QStringList printed = lines(result.err);
+            QCOMPARE(printed.size(), 1);
+            QVERIFY2(
+                printed.first().startsWith(u"quillane-cli: "_s + said.replace(u"%1"_s, folder)),
+                result.err.constData());
+            QCOMPARE(printed.first().contains(u" Try 'quillane-cli "_s), status == 2);
+        }
+        QCOMPARE(fileBytes(db), before);
+        QCOMPARE(fileBytes(output()), QByteArray("keep me\r\n"));
     }
 
     // The window's results for seed 42, saved by its "Start Saving Results"
@@ -340,36 +394,6 @@ private Q_SLOTS:
         for (qsizetype row = 0; row < rows.size(); ++row)
             cells.append(u"A%1 %2"_s.arg(row + 1).arg(rows.at(row)));
         QCOMPARE(readWorkbook(book), cells.join(u','));
-    }
-
-    // The count is read as the window reads it, in the user's number format.
-    void readsTheCountAsTheWindowDoes_data()
-    {
-        QTest::addColumn<QString>("count");
-        QTest::addColumn<QString>("locale");
-        QTest::addColumn<int>("rows");
-        QTest::newRow("plain") << u"25"_s << u"C.UTF-8"_s << 25;
-        QTest::newRow("decimal comma") << u"3,5"_s << u"de_DE.UTF-8"_s << 4;
-        QTest::newRow("none") << u"0"_s << u"C.UTF-8"_s << 0;
-        QTest::newRow("beyond the window's bound") << u"1000000.6"_s << u"C.UTF-8"_s << 1000001;
-    }
-
-    void readsTheCountAsTheWindowDoes()
-    {
-        QFETCH(QString, count);
-        QFETCH(QString, locale);
-        const Run result = run({u"generate"_s, u"-n"_s, count}, locale);
-        QCOMPARE(result.status, 0);
-        QTEST(int(result.out.count('\n')), "rows");
-    }
-
-    void theSeedReplaysARun()
-    {
-        const QStringList generate{u"generate"_s, u"-n"_s, u"500"_s, u"--seed"_s};
-        const Run first = run(generate + QStringList{u"7"_s});
-        QCOMPARE(lines(first.out).size(), 500);
-        QCOMPARE(run(generate + QStringList{u"7"_s}).out, first.out);
-        QVERIFY(run(generate + QStringList{u"8"_s}).out != first.out);
     }
 
     // The list commands change the lists as the window's buttons do, and
@@ -450,50 +474,6 @@ private Q_SLOTS:
         QCOMPARE(QFileInfo(path).permissions() & ~(QFile::ReadUser | QFile::WriteUser),
                  permissions);
         QCOMPARE(QDir(env->folder()).entryList(QDir::Files | QDir::Hidden).size(), 2);
-    }
-
-    void helpAndVersion_data()
-    {
-        QTest::addColumn<QStringList>("arguments");
-        QTest::addColumn<QString>("start");
-        QTest::newRow("--help") << QStringList{u"--help"_s} << u"Usage: quillane-cli [--"_s;
-        QTest::newRow("--version") << QStringList{u"--version"_s} << u"quillane-cli 1."_s;
-        for (const QString& command :
-             {u"generate"_s, u"names"_s, u"add"_s, u"delete"_s, u"clear"_s, u"import"_s}) {
-            QTest::addRow("%s --help", qPrintable(command))
-                << QStringList{command, u"--help"_s} << u"Usage: quillane-cli %1 "_s.arg(command);
-        }
-    }
-
-    void helpAndVersion()
-    {
-        QFETCH(QStringList, arguments);
-        QFETCH(QString, start);
-        const Run result = cli(arguments);
-        QCOMPARE(result.status, 0);
-        QVERIFY(result.err.isEmpty());
-        QVERIFY2(QString::fromUtf8(result.out).startsWith(start), result.out.constData());
-    }
-
-    // A list, and a stream cut off while its threads are still making rows.
-    void aFullStandardOutputIsAFailure_data()
-    {
-        QTest::addColumn<QStringList>("command");
-        QTest::newRow("names") << QStringList{u"names"_s, u"last"_s};
-        QTest::newRow("generate on threads")
-            << QStringList{u"generate"_s, u"-n"_s, u"3000000"_s, u"--threads"_s, u"4"_s};
-    }
-
-    void aFullStandardOutputIsAFailure()
-    {
-        QFETCH(QStringList, command);
-        QProcess process;
-        process.setStandardOutputFile(u"/dev/full"_s);
-        process.start(Cli, QStringList{u"--database"_s, db} + command);
-        QVERIFY(process.waitForFinished(60000));
-        QCOMPARE(process.exitCode(), 1);
-        QCOMPARE(process.readAllStandardError(),
-                 QByteArray("quillane-cli: standard output: No space left on device\n"));
     }
 
     // No two names alike, counted as printed: a list of three first names

@@ -22,12 +22,14 @@
 #include <QLocale>
 #include <QRegularExpression>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <functional>
 #include <limits>
 #include <map>
 #include <optional>
+#include <utility>
 #include <variant>
 
 using namespace Qt::StringLiterals;
@@ -49,6 +51,13 @@ struct UsageProblem {
 [[noreturn]] void usage(const QString& message, const QString& command = {})
 {
     throw UsageProblem{message, command};
+}
+
+// An option that takes a value is a slip when given twice, and so, for one
+// rule, is any other: none of them is quietly overridden.
+[[noreturn]] void givenTwice(const QString& option, const QString& command = {})
+{
+    usage(u"%1 is given more than once."_s.arg(option), command);
 }
 
 const char GeneralHelp[] = R"(Usage: quillane-cli [--database FILE] COMMAND [OPTIONS]
@@ -113,8 +122,9 @@ Options:
                        format a FILE ending in .csv, .tsv, .jsonl, .sql or
                        .xlsx (xlsx2) names, else text.
   --table NAME         the table the sql format inserts into (default: people)
-  -o, --output FILE    write to FILE instead of standard output; an existing
-                       FILE is replaced only once the new one is complete
+  -o, --output FILE    write to FILE instead of standard output ('-'); an
+                       existing FILE is replaced only once the new one is
+                       complete
   --database FILE      the names database
 )"},
     {u"names"_s, R"(Usage: quillane-cli names first|last [OPTIONS]
@@ -251,26 +261,45 @@ public:
 private:
     // The options every command takes, then the command's own. False when
     // the command's help was asked for: it is shown, and the command ends.
-    bool parse(const QList<QCommandLineOption>& options, int leastPositional, int mostPositional)
+    // Help is shown for a command line still being typed, with too few
+    // arguments, but not for one that could not run as written.
+    bool parse(QList<QCommandLineOption> options, int leastPositional, int mostPositional)
     {
+        options += {{u"database"_s, {}, u"FILE"_s}, {{u"h"_s, u"help"_s}, {}}};
         m_parser.addOptions(options);
-        m_parser.addOption({u"database"_s, {}, u"FILE"_s});
-        m_parser.addOption({{u"h"_s, u"help"_s}, {}});
         m_parser.setSingleDashWordOptionMode(QCommandLineParser::ParseAsCompactedShortOptions);
-        if (!m_parser.parse(QStringList{Program} + m_arguments))
-            usage(m_parser.errorText(), m_name);
+        if (!m_parser.parse(QStringList{Program} + m_arguments)) {
+            const QStringList unknown = m_parser.unknownOptionNames();
+            if (unknown.isEmpty())
+                usage(m_parser.errorText(), m_name);
+            // Written as typed: one letter after '-', a word after '--'.
+            usage(u"Unknown option '%1%2'."_s.arg(unknown.first().size() == 1 ? u"-" : u"--",
+                                                  unknown.first()),
+                  m_name);
+        }
+        const QStringList found = m_parser.optionNames();
+        for (const QCommandLineOption& option : options) {
+            if (std::ranges::count_if(
+                    found, [&](const QString& name) { return option.names().contains(name); })
+                > 1)
+                givenTwice(u"--"_s + option.names().last(), m_name);
+        }
+        const QStringList positional = m_parser.positionalArguments();
+        if (mostPositional >= 0 && positional.size() > mostPositional)
+            usage(u"Unexpected argument '%1'."_s.arg(positional.at(mostPositional)), m_name);
         if (m_parser.isSet(u"help"_s)) {
             write(QByteArray(CommandHelp.at(m_name)));
             return false;
         }
-        if (m_parser.isSet(u"database"_s))
-            m_database = m_parser.value(u"database"_s);
-        const qsizetype count = m_parser.positionalArguments().size();
-        if (count < leastPositional)
+        if (positional.size() < leastPositional)
             usage(u"Too few arguments."_s, m_name);
-        if (mostPositional >= 0 && count > mostPositional)
-            usage(u"Unexpected argument '%1'."_s.arg(m_parser.positionalArguments().at(count - 1)),
-                  m_name);
+        if (m_parser.isSet(u"database"_s)) {
+            if (!m_database.isEmpty())
+                givenTwice(u"--database"_s, m_name);
+            m_database = m_parser.value(u"database"_s);
+            if (m_database.isEmpty())
+                usage(u"--database needs a file name."_s, m_name);
+        }
         if (m_database.isEmpty())
             m_database = namesDatabaseInUse(m_programFolder);
         return true;
@@ -382,7 +411,8 @@ GenerateRequest Command::readGenerate()
         bool ok = false;
         const QString text = value(u"seed"_s);
         const qulonglong seed = text.toULongLong(&ok);
-        if (!ok || text.startsWith(u'-') || text.startsWith(u'+'))
+        // The conversion refuses a minus sign but takes a plus.
+        if (!ok || text.startsWith(u'+'))
             usage(u"--seed takes a whole number from 0 to 18446744073709551615, not '%1'."_s.arg(
                       text),
                   m_name);
@@ -412,6 +442,8 @@ GenerateRequest Command::readGenerate()
     }
 
     request.output = value(u"output"_s);
+    if (m_parser.isSet(u"output"_s) && request.output.isEmpty())
+        usage(u"-o needs a file name, or '-' for standard output."_s, m_name);
     if (request.output == u"-")
         request.output.clear();
     if (m_parser.isSet(u"format"_s)) {
@@ -605,39 +637,58 @@ int run(const QStringList& arguments, const QString& programFolder, std::FILE* o
             std::fputs(qUtf8Printable(Program + u": "_s + escapeControlCharacters(line) + u'\n'),
                        err);
     };
-    QString database;
     try {
-        // The options before the command, then the command and its own.
+        // The options before the command, in any order, then the command and
+        // its own.
+        std::optional<QString> database;
+        bool help = false;
+        bool version = false;
         qsizetype at = 1;
         for (; at < arguments.size() && arguments.at(at).startsWith(u'-'); ++at) {
             const QString& option = arguments.at(at);
             if (option == u"-h" || option == u"--help") {
-                std::fputs(GeneralHelp, out);
-                return Done;
-            }
-            if (option == u"--version") {
-                const QString where =
-                    database.isEmpty() ? describeNamesDatabase(chooseNamesDatabase(programFolder))
-                                       : u"names database: "_s + database;
-                std::fputs(qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'
-                                          + where + u'\n'),
-                           out);
-                return Done;
-            }
-            if (option == u"--database" && at + 1 < arguments.size())
-                database = arguments.at(++at);
-            else if (option.startsWith(u"--database="))
-                database = option.section(u'=', 1);
-            else
+                if (std::exchange(help, true))
+                    givenTwice(u"--help"_s);
+            } else if (option == u"--version") {
+                if (std::exchange(version, true))
+                    givenTwice(option);
+            } else if (option == u"--database" || option.startsWith(u"--database=")) {
+                if (database)
+                    givenTwice(u"--database"_s);
+                if (option == u"--database" && ++at == arguments.size())
+                    usage(u"Missing value after '--database'."_s);
+                database = option == u"--database" ? arguments.at(at) : option.section(u'=', 1);
+                // Never the default database in place of one a script
+                // failed to name.
+                if (database->isEmpty())
+                    usage(u"--database needs a file name."_s);
+            } else {
                 usage(u"Unknown option '%1'."_s.arg(option));
+            }
         }
-        if (at == arguments.size())
+        const QStringList command = arguments.mid(at);
+        if (version) {
+            if (!command.isEmpty())
+                usage(u"Unexpected argument '%1'."_s.arg(command.first()));
+            const QString where = database
+                                      ? u"names database: "_s + *database
+                                      : describeNamesDatabase(chooseNamesDatabase(programFolder));
+            std::fputs(qUtf8Printable(Program + u' ' + QStringLiteral(QUILLANE_VERSION) + u'\n'
+                                      + where + u'\n'),
+                       out);
+            return Done;
+        }
+        if (help && command.isEmpty()) {
+            std::fputs(GeneralHelp, out);
+            return Done;
+        }
+        if (command.isEmpty())
             usage(u"Give a command."_s);
-        const QString name = arguments.at(at);
-        if (!CommandHelp.contains(name))
-            usage(u"'%1' is not a command."_s.arg(name));
-        Command command(name, arguments.mid(at + 1), database, programFolder, out);
-        return command.run();
+        // --help before a command asks for that command's help.
+        return Command(command.first(),
+                       command.mid(1) + (help ? QStringList{u"--help"_s} : QStringList{}),
+                       database.value_or(QString()), programFolder, out)
+            .run();
     } catch (const UsageProblem& problem) {
         // One line, the way to the help included.
         complain(u"%1 Try '%2 %3--help'."_s.arg(
