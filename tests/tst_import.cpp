@@ -155,8 +155,8 @@ int readsToFail = 0;
 // imports among them.
 extern "C" ssize_t read(int fd, void* data, size_t size)
 {
-    static const auto system = reinterpret_cast<ssize_t (*)(int, void*, size_t)>(
-        dlsym(RTLD_NEXT, "read"));
+    static const auto system =
+        reinterpret_cast<ssize_t (*)(int, void*, size_t)>(dlsym(RTLD_NEXT, "read"));
     struct stat info {};
     if (FaultyRead::file != 0 && ::fstat(fd, &info) == 0 && info.st_ino == FaultyRead::file
         && --FaultyRead::readsToFail == 0) {
@@ -321,9 +321,9 @@ private Q_SLOTS:
         rig.env.dialogs.answerOpen(paths);
         QFETCH(int, failingRead);
         struct stat info {};
-        FaultyRead::file = failingRead && ::stat(QFile::encodeName(paths[0]).constData(), &info) == 0
-                               ? info.st_ino
-                               : 0;
+        FaultyRead::file =
+            failingRead && ::stat(QFile::encodeName(paths[0]).constData(), &info) == 0 ? info.st_ino
+                                                                                       : 0;
         FaultyRead::readsToFail = failingRead;
         rig.editor.PushButton6_Click();
         FaultyRead::file = 0;
@@ -458,8 +458,8 @@ private Q_SLOTS:
                 other, "quill", 1, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
                 [](sqlite3_context* c, int, sqlite3_value** v) { sqlite3_result_value(c, v[0]); },
                 nullptr, nullptr, nullptr);
-            const QByteArray sql = u"create index quill on %1 (quill(%2))"_s.arg(table, column)
-                                       .toUtf8();
+            const QByteArray sql =
+                u"create index quill on %1 (quill(%2))"_s.arg(table, column).toUtf8();
             QCOMPARE(sqlite3_exec(other, sql.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
             sqlite3_close(other);
         }
@@ -482,8 +482,9 @@ private Q_SLOTS:
         writeBytes(env.filePath(u"names.txt"_s), bytes);
         FakePointer pointer;
         NameLists lists(db);
-        ListEditor editor(env.dialogs, db, lists, pointer,
-                          [&] { return ListChoice{!user, user, true, false, false}; });
+        ListEditor editor(env.dialogs, db, lists, pointer, [&] {
+            return ListChoice{!user, user, true, false, false};
+        });
         env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
         button == 6 ? editor.PushButton6_Click() : editor.PushButton7_Click();
 
