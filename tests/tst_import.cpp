@@ -1,6 +1,7 @@
 // Importing names from text files: how a file's bytes become names, what
 // the user is told, and that no file, however strange, harms the database.
 #include "app/listeditor.h"
+#include "names/listoperations.h"
 #include "names/namelists.h"
 #include "names/namesplitter.h"
 #include "support/fakepointer.h"
@@ -14,10 +15,12 @@
 #include <sqlite3.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/types.h>
 #include <unistd.h>
 
 #include <cerrno>
 #include <csignal>
+#include <optional>
 
 using namespace Qt::StringLiterals;
 
@@ -347,6 +350,58 @@ private Q_SLOTS:
         rig.lists.RefreshLists(rig.choice);
     }
 
+    // What importNameFile tells its caller of a file or a database that
+    // cannot be opened, and of a choice with no list: nothing is stored.
+    void problemsBeforeTheFirstName_data()
+    {
+        QTest::addColumn<QString>("path");  // in the test's folder, or absolute
+        QTest::addColumn<bool>("database"); // there is one
+        QTest::addColumn<ListChoice>("choice");
+        QTest::addColumn<QStringList>("problems"); // step, culprit: description
+        const ListChoice user{false, true, true, false, false},
+            none{false, false, true, false, false};
+        const QString notAFile = u"%1 is not a file that names can be read from."_s;
+        QTest::newRow("missing") << u"missing.txt"_s << true << user
+                                 << QStringList{u"0 1: File not found"_s};
+        QTest::newRow("a folder") << u"folder"_s << true << user
+                                  << QStringList{u"2 1: "_s + notAFile.arg(u"%1/folder"_s)};
+        QTest::newRow("a FIFO") << u"fifo"_s << true << user
+                                << QStringList{u"2 1: "_s + notAFile.arg(u"%1/fifo"_s)};
+        // Write-only, even for root.
+        QTest::newRow("unreadable") << u"/proc/sys/vm/drop_caches"_s << true << user
+                                    << QStringList{u"2 1: The file /proc/sys/vm/drop_caches "
+                                                   u"cannot be read: Permission denied"_s};
+        QTest::newRow("no database") << u"names.txt"_s << false << user
+                                     << QStringList{u"1 2: %1/names.mdb: unable to open "
+                                                    u"database file"_s};
+        QTest::newRow("no list chosen") << u"names.txt"_s << true << none << QStringList();
+    }
+
+    void problemsBeforeTheFirstName()
+    {
+        QFETCH(QString, path);
+        QFETCH(bool, database);
+        QFETCH(ListChoice, choice);
+        QFETCH(QStringList, problems);
+        TestEnvironment env(database);
+        QVERIFY(QDir(env.folder()).mkdir(u"folder"_s));
+        QVERIFY(::mkfifo(QFile::encodeName(env.filePath(u"fifo"_s)).constData(), 0600) == 0);
+        writeBytes(env.filePath(u"names.txt"_s), "Ann\n");
+        std::optional<Connection> connection;
+        QStringList heard;
+        importNameFile([&]() -> Connection& { return connection.emplace(env.databasePath()); },
+                       QDir(env.folder()).filePath(path), ListKind::FirstNames, choice,
+                       [&](const ImportProblem& problem) {
+                           heard += u"%1 %2: %3"_s.arg(int(problem.step))
+                                        .arg(int(problem.culprit))
+                                        .arg(problem.description);
+                       });
+        QCOMPARE(heard, problems.replaceInStrings(u"%1"_s, env.folder()));
+        connection.reset();
+        QVERIFY(!database
+                || tableColumn(env.databasePath(), u"user_firstname"_s, u"*"_s).isEmpty());
+    }
+
     // Every write of a small import, a clear and a delete fails in turn, as
     // SQLite's own tests fail them: the operation is reported once, naming
     // the database, and the database holds what it held before (an import
@@ -428,15 +483,20 @@ private Q_SLOTS:
         QTest::addColumn<qint64>("size");
         QTest::addColumn<int>("button"); // 6 first names, 7 last names
         QTest::addColumn<bool>("user");
-        QTest::addColumn<int>("failedStep"); // with another program's index; 0: without
+        // Another index of the list: of a function of another program's, or
+        // unique (the file then starts with the name already there).
+        QTest::addColumn<QString>("index");
+        QTest::addColumn<int>("failedStep"); // the one report's; 0: none
         const qint64 bulk = 4 << 20;
-        QTest::newRow("just below") << bulk - 1 << 6 << true << 0;
-        QTest::newRow("at") << bulk << 6 << true << 0;
-        QTest::newRow("above, built-in first names") << bulk + 1 << 6 << false << 0;
-        QTest::newRow("at, built-in last names") << bulk << 7 << false << 0;
-        QTest::newRow("at, user last names") << bulk << 7 << true << 0;
-        QTest::newRow("below: no insert can begin") << bulk - 1 << 6 << true << 30;
-        QTest::newRow("at: the rebuild fails") << bulk << 6 << true << 70;
+        const QString none, quill = u"quill"_s, unique = u"unique"_s;
+        QTest::newRow("just below") << bulk - 1 << 6 << true << none << 0;
+        QTest::newRow("at") << bulk << 6 << true << none << 0;
+        QTest::newRow("above, built-in first names") << bulk + 1 << 6 << false << none << 0;
+        QTest::newRow("at, built-in last names") << bulk << 7 << false << none << 0;
+        QTest::newRow("at, user last names") << bulk << 7 << true << none << 0;
+        QTest::newRow("below: no insert can begin") << bulk - 1 << 6 << true << quill << 30;
+        QTest::newRow("at: the rebuild fails") << bulk << 6 << true << quill << 70;
+        QTest::newRow("at: a unique index stays") << bulk << 6 << true << unique << 50;
     }
 
     void largeFilesKeepTheIndexes()
@@ -444,6 +504,7 @@ private Q_SLOTS:
         QFETCH(qint64, size);
         QFETCH(int, button);
         QFETCH(bool, user);
+        QFETCH(QString, index);
         QFETCH(int, failedStep);
         const int list = (user ? 3 : 1) + (button == 7); // index into DatabaseTables
         const QString table = DatabaseTables[list], column = DatabaseColumns[list];
@@ -451,15 +512,17 @@ private Q_SLOTS:
         const QString db = env.databasePath();
         createEmptyDatabase(db);
         insertRows(db, table, column, {u"Old"_s});
-        if (failedStep) {
+        if (!index.isEmpty()) {
             sqlite3* other = nullptr;
             sqlite3_open(QFile::encodeName(db).constData(), &other);
             sqlite3_create_function_v2(
                 other, "quill", 1, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
                 [](sqlite3_context* c, int, sqlite3_value** v) { sqlite3_result_value(c, v[0]); },
                 nullptr, nullptr, nullptr);
-            const QByteArray sql =
-                u"create index quill on %1 (quill(%2))"_s.arg(table, column).toUtf8();
+            const QByteArray sql = (index == u"quill" ? u"create index quill on %1 (quill(%2))"_s
+                                                      : u"create unique index once on %1 (%2)"_s)
+                                       .arg(table, column)
+                                       .toUtf8();
             QCOMPARE(sqlite3_exec(other, sql.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
             sqlite3_close(other);
         }
@@ -470,7 +533,7 @@ private Q_SLOTS:
         };
         const QStringList before = schema();
         // Lines of 250 bytes, the last one shorter.
-        QByteArray bytes;
+        QByteArray bytes = index == u"unique" ? "Old\n" : "";
         QStringList names{u"Old"_s};
         while (bytes.size() < size) {
             const qint64 left = size - bytes.size();
@@ -491,13 +554,15 @@ private Q_SLOTS:
         const QStringList messages = env.dialogs.messages();
         QCOMPARE(messages.size(), failedStep ? 1 : 0);
         if (failedStep) {
-            QVERIFY2(messages[0].contains(u"function: quill"_s), qPrintable(messages[0]));
+            QVERIFY2(messages[0].contains(index == u"quill" ? u"function: quill"_s
+                                                            : u"UNIQUE constraint failed"_s),
+                     qPrintable(messages[0]));
             QVERIFY(messages[0].endsWith(errorReportText({}, u"in Tessmark.Main.FileToListview "_s,
                                                          failedStep, ClosingLine::Long)));
-        } else {
-            QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
         }
-        QCOMPARE(tableColumn(db, table, column), failedStep ? QStringList{u"Old"_s} : names);
+        if (index != u"quill") // another program's function is needed to check that index
+            QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
+        QCOMPARE(tableColumn(db, table, column), index == u"quill" ? QStringList{u"Old"_s} : names);
         QCOMPARE(schema(), before);
     }
 

@@ -101,6 +101,12 @@ private Q_SLOTS:
         QTest::newRow("none selected, last") << Click{.choice = Both, .button = 3, .reports = {40}};
         QTest::newRow("clear first names, none selected")
             << Click{.choice = User, .button = 4, .tables = {uf}};
+        // The first delete's step fails, and the rest is not tried.
+        QTest::newRow("delete, no database") << Click{.choice = Both,
+                                                      .button = 4,
+                                                      .reports = {10, 20, 70},
+                                                      .closing = Short,
+                                                      .noDatabase = true};
         QTest::newRow("PushButton2")
             << Click{.choice = Both, .button = 2, .reports = {10, 50}, .noDatabase = true};
         QTest::newRow("PushButton5")
@@ -288,6 +294,85 @@ private Q_SLOTS:
         QMap<QString, QStringList> all = snapshot(db);
         all[u"user_lastname"_s] = others[u"user_lastname"_s];
         QCOMPARE(all, others);
+    }
+
+    // Deleting first names from the built-in list: all of them or, when a
+    // failure ends the delete, none; a step that traps a refused statement
+    // goes on with the next, unless the refusal undid the transaction.
+    void deletingNames_data()
+    {
+        QTest::addColumn<ListChoice>("choice");
+        QTest::addColumn<QStringList>("names");
+        QTest::addColumn<bool>("refuseAbsent");
+        QTest::addColumn<QByteArray>("rule"); // how a rule refuses deleting the male Bo
+        QTest::addColumn<bool>("trapped");
+        QTest::addColumn<QStringList>("after"); // the male and female first names
+        QTest::addColumn<QStringList>("failures");
+        const ListChoice noGender{.both = false};
+        const QString both = u"Ann,Bo"_s, ann = u"Ann"_s;
+        const QStringList bo{u"Bo"_s}, boZed{u"Bo"_s, u"Zed"_s}, no{u"no"_s};
+        const auto row = [](const char* tag, ListChoice choice, const QStringList& names,
+                            bool refuseAbsent, const char* rule, bool trapped, QString m, QString f,
+                            const QStringList& failures = {}) {
+            QTest::newRow(tag) << choice << names << refuseAbsent << QByteArray(rule) << trapped
+                               << QStringList{m, f} << failures;
+        };
+        row("no gender chosen", noGender, bo, true, "", false, both, both);
+        row("no names", Both, {}, true, "", false, both, both);
+        row("an absent name ignored", Both, boZed, false, "", false, ann, ann);
+        row("an absent name refused", Both, boZed, true, "", false, both, both,
+            {u"\"Zed\" is not in the list: nothing was deleted."_s});
+        row("refused", Both, bo, false, "abort", false, both, both, no);
+        row("refused, trapped", Both, bo, false, "abort", true, both, ann, no);
+        row("undone, trapped", Both, bo, false, "rollback", true, both, both, no);
+    }
+
+    void deletingNames()
+    {
+        QFETCH(ListChoice, choice);
+        QFETCH(QStringList, names);
+        QFETCH(bool, refuseAbsent);
+        QFETCH(QByteArray, rule);
+        QFETCH(bool, trapped);
+        QTemporaryDir folder;
+        const QString db = folder.filePath(u"names.mdb"_s);
+        createEmptyDatabase(db);
+        for (qsizetype t = 0; t < Tables.size(); ++t)
+            insertRows(db, Tables[t], Columns[t], {u"Ann"_s, u"Bo"_s});
+        std::optional<Connection> connection;
+        connection.emplace(db);
+        if (!rule.isEmpty())
+            connection->execute(QByteArray("create trigger refuse before delete on "
+                                           "system_mfirstname when old.Mfirst = 'Bo' begin "
+                                           "select raise("
+                                           + rule + ", 'no'); end")
+                                    .constData());
+        const QMap<QString, QStringList> before = snapshot(db);
+        QStringList failures;
+        const StatementStep trap = [&](const char*, const std::function<void()>& work) {
+            try {
+                work();
+                return true;
+            } catch (const Failure& f) {
+                failures += f.description();
+                return false;
+            }
+        };
+        try {
+            ::deleteNames([&]() -> Connection& { return *connection; }, ListKind::FirstNames,
+                          choice, names, refuseAbsent ? AbsentNames::Refuse : AbsentNames::Ignore,
+                          trapped ? trap : StatementStep());
+        } catch (const Failure& f) {
+            failures += f.description();
+        }
+        QVERIFY(!connection->inTransaction());
+        connection.reset();
+        QTEST(failures, "failures");
+        QMap<QString, QStringList> all = snapshot(db);
+        QTEST((QStringList{all.take(Tables[0]).join(u','), all.take(Tables[1]).join(u',')}),
+              "after");
+        for (const QString& table : all.keys())
+            QCOMPARE(all[table], before[table]);
     }
 
     void theWindowsButtonsEditTheLists()
