@@ -296,7 +296,7 @@ private Q_SLOTS:
         row("10 refused", {bad(10)}, u"Ann|Cy"_s, QStringList(10, refused(u"no"_s)), refuseBad);
         row("11 refused", {bad(11)}, u"Ann|Cy"_s,
             QStringList(10, refused(u"no"_s))
-                << errorReportText(u"1 more names of this file were not stored."_s, at, 60, Long),
+                << errorReportText(u"1 more name of this file was not stored."_s, at, 60, Long),
             refuseBad);
         // A rule that undoes the whole transaction ends the import: nothing stays.
         row("a rule that rolls back", {"Ann\nBad\nCy"}, u""_s,

@@ -286,6 +286,41 @@ private Q_SLOTS:
         QCOMPARE(layout(ListRows(byName)), bytes);
     }
 
+    // The results list as a view reads and edits it: the first name alone
+    // is retyped in place, and retyping it as it was changes nothing, so
+    // the rows are still saved from names encoded once.
+    void theResultsListAsAViewSeesIt()
+    {
+        ResultsModel model;
+        model.addColumn(u"First"_s);
+        model.addColumn(u"Last"_s);
+        GeneratedNames generated;
+        generated.firstNames = QStringList{u"Ann"_s};
+        generated.lastNames = QStringList{u"Lee"_s};
+        generated.rows = {{0, 0}};
+        model.setRows(generated);
+        const QModelIndex first = model.index(0, 0), last = model.index(0, 1), none;
+        QCOMPARE(model.data(first, Qt::EditRole), QVariant(u"Ann"_s));
+        QCOMPARE(model.data(last, Qt::DisplayRole), QVariant(u"Lee"_s));
+        QCOMPARE(model.data(first, Qt::ToolTipRole), QVariant());
+        QCOMPARE(model.data(none, Qt::DisplayRole), QVariant());
+        QCOMPARE(model.rowCount(first) + model.columnCount(first), 0);
+        QCOMPARE(model.firstName(1) + model.firstName(-1) + model.lastName(1), QString());
+        QCOMPARE(model.headerData(1, Qt::Horizontal, Qt::DisplayRole), QVariant(u"Last"_s));
+        QCOMPARE(model.headerData(2, Qt::Horizontal, Qt::DisplayRole), QVariant());
+        QCOMPARE(model.headerData(0, Qt::Vertical, Qt::DisplayRole), QVariant());
+        QVERIFY(model.flags(first) & Qt::ItemIsEditable);
+        QVERIFY(!(model.flags(last) & Qt::ItemIsEditable));
+        QCOMPARE(model.flags(none), Qt::NoItemFlags);
+        QVERIFY(!model.setData(last, u"Bo"_s, Qt::EditRole));
+        QVERIFY(!model.setData(first, u"Bo"_s, Qt::DisplayRole));
+        QVERIFY(model.setData(first, u"Ann"_s, Qt::EditRole));
+        QVERIFY(model.indexedNames());
+        QVERIFY(model.setData(first, u"Bo"_s, Qt::EditRole));
+        QVERIFY(!model.indexedNames());
+        QCOMPARE(resultsText(model), QByteArray("Bo Lee\r\n"));
+    }
+
     // A field is quoted, its quotes doubled, where a CSV reader would split
     // it: at a comma, a quote, and either half of a line end. Rows kept as
     // indices and rows kept by name alike.
