@@ -241,6 +241,7 @@ private Q_SLOTS:
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<QString>("stored"); // user_lastname afterwards, joined by '|'
         QTest::addColumn<QString>("failure");
+        QTest::addColumn<bool>("joined"); // to the caller's transaction, which it rolls back
         const QString x254(254, u'x'), e255(255, u'\u00EB'), e256(256, u'\u00EB');
         const QString a127 = u"a"_s + QString(u"\U0001F600"_s).repeated(127);
         const auto tooLong = [](const QString& name) {
@@ -248,8 +249,9 @@ private Q_SLOTS:
                 name.left(40));
         };
         const auto row = [](const char* tag, const QStringList& typed, const QString& stored,
-                            const QString& failure = {}, ListChoice choice = User) {
-            QTest::newRow(tag) << typed << choice << stored << failure;
+                            const QString& failure = {}, ListChoice choice = User,
+                            bool joined = false) {
+            QTest::newRow(tag) << typed << choice << stored << failure << joined;
         };
         row("254 and 255 characters", {x254, x254 + u'y'}, u"Old|"_s + x254 + u'|' + x254 + u'y');
         row("256 characters", {u"Ann"_s, x254 + u"yz"_s}, u"Old"_s, tooLong(x254));
@@ -265,7 +267,10 @@ private Q_SLOTS:
         row("a rule refuses the second", {u"Ann"_s, u"Bad"_s, u"Bo"_s}, u"Old"_s, u"no"_s);
         row("a blank one", {u"Ann"_s, u"  "_s}, u"Old"_s,
             u"The name \"  \" is blank: nothing was added."_s);
+        row("a paragraph separator", {u"Ann\u2029Lee"_s}, u"Old"_s,
+            u"The name \"Ann\\u2029Lee\" holds a control character and was not stored."_s);
         row("no source chosen", {u"Ann"_s, u"  "_s}, u"Old"_s, {}, ListChoice{.builtIn = false});
+        row("joined to the caller's", {u"Ann"_s}, u"Old"_s, {}, User, true);
     }
 
     void addingSeveralNames()
@@ -281,6 +286,10 @@ private Q_SLOTS:
         connection.emplace(db).execute(
             "create trigger refuse before insert on user_lastname when new.lastname = 'Bad' "
             "begin select raise(abort, 'no'); end");
+        QFETCH(bool, joined);
+        std::optional<Connection::Transaction> callers;
+        if (joined)
+            callers.emplace(*connection);
         QString failure;
         try {
             addNames([&]() -> Connection& { return *connection; }, ListKind::LastNames, choice,
@@ -288,6 +297,8 @@ private Q_SLOTS:
         } catch (const Failure& f) {
             failure = f.description();
         }
+        QCOMPARE(connection->inTransaction(), joined);
+        callers.reset();
         connection.reset();
         QTEST(failure, "failure");
         QTEST(tableColumn(db, u"user_lastname"_s, u"*"_s).join(u'|'), "stored");

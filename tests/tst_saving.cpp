@@ -18,6 +18,7 @@
 #include <QFile>
 #include <QFileInfo>
 #include <QProcess>
+#include <QRegularExpression>
 #include <QTemporaryDir>
 #include <QTemporaryFile>
 #include <QTest>
@@ -728,24 +729,52 @@ private Q_SLOTS:
     }
 
     // A workbook is never given the name of a file that is there: one made
-    // in the same second as another is told apart by a number.
+    // in the same second as others is told apart by a number, up to 1000.
+    void aWorkbookNeverReplacesAFile_data()
+    {
+        QTest::addColumn<int>("taken");    // workbooks of this second already there
+        QTest::addColumn<QString>("name"); // after the second; empty: refused
+        QTest::newRow("none") << 0 << u".xlsx"_s;
+        QTest::newRow("one") << 1 << u" (2).xlsx"_s;
+        QTest::newRow("999") << 999 << u" (1000).xlsx"_s;
+        QTest::newRow("1000") << 1000 << QString();
+    }
+
     void aWorkbookNeverReplacesAFile()
     {
+        QFETCH(int, taken);
+        QFETCH(QString, name);
         QTemporaryDir dir;
         FakeShell shell;
         SpreadsheetApplication spreadsheet(shell, dir.path());
-        // This second and the next are taken, whichever the workbook is made in.
+        // This second's and the next's, whichever the workbook is made in.
         const QDateTime now = QDateTime::currentDateTime();
-        for (const QDateTime& moment : {now, now.addSecs(1)})
-            writeFile(
-                dir.filePath(moment.toString(u"'Quillane names 'yyyy-MM-dd HH.mm.ss'.xlsx'"_s)),
-                "theirs");
-        spreadsheet.Workbooks().Add();
-        spreadsheet.setVisible(true);
-        QVERIFY2(spreadsheet.documentPath().endsWith(u" (2).xlsx"_s),
-                 qPrintable(spreadsheet.documentPath()));
-        QCOMPARE(shell.documents, QStringList{spreadsheet.documentPath()});
-        QCOMPARE(entries(dir.path()).size(), 3);
+        for (const QDateTime& moment : {now, now.addSecs(1)}) {
+            const QString stem = moment.toString(u"'Quillane names 'yyyy-MM-dd HH.mm.ss"_s);
+            for (int n = 1; n <= taken; ++n)
+                writeFile(
+                    dir.filePath(n == 1 ? stem + u".xlsx"_s : u"%1 (%2).xlsx"_s.arg(stem).arg(n)),
+                    "theirs");
+        }
+        QString failure;
+        try {
+            spreadsheet.Workbooks().Add();
+            spreadsheet.setVisible(true);
+        } catch (const Failure& f) {
+            failure = f.description();
+        }
+        if (name.isEmpty()) {
+            QCOMPARE(failure,
+                     u"The folder %1 holds too many workbooks of this second"_s.arg(dir.path()));
+            QCOMPARE(shell.documents, QStringList());
+        } else {
+            const QRegularExpression named(u"/Quillane names [0-9. -]{19}"_s
+                                           + QRegularExpression::escape(name) + u'$');
+            QVERIFY2(named.match(spreadsheet.documentPath()).hasMatch(),
+                     qPrintable(spreadsheet.documentPath()));
+            QCOMPARE(shell.documents, QStringList{spreadsheet.documentPath()});
+        }
+        QCOMPARE(entries(dir.path()).size(), 2 * taken + !name.isEmpty());
     }
 
     void workbook_data()
