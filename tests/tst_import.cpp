@@ -245,8 +245,11 @@ private Q_SLOTS:
         row("a 20 MB line", {QByteArray(20 << 20, 'z') + "\nAfter"}, {});
         // The file is read 256 KiB at a time: names and characters cut by a
         // read come out whole.
-        const QByteArray pad = QByteArray("Pad\n").repeated(65535); // 4 bytes short of a read
-        const QString pads = QStringList(65535, u"Pad"_s).join(u'|');
+        // Names of 249 and 139 characters, 4 bytes short of a read.
+        const QByteArray pad =
+            QByteArray(QByteArray(249, 'p') + '\n').repeated(1048) + QByteArray(139, 'q') + '\n';
+        const QString pads =
+            (QStringList(1048, QString(249, u'p')) << QString(139, u'q')).join(u'|');
         row("a line ending with the read", {pad + "Ann\nBo"}, pads + u"|Ann|Bo"_s);
         row("a name across reads", {pad + "Annabel\nBo"}, pads + u"|Annabel|Bo"_s);
         row("CR LF across reads", {pad + "Ann\r\nBo"}, pads + u"|Ann|Bo"_s);
