@@ -244,8 +244,7 @@ private Q_SLOTS:
         row("across reads", {QByteArray("\xC3\xAB\n").repeated(100000)}, {});
         row("a 20 MB line", {QByteArray(20 << 20, 'z') + "\nAfter"}, {});
         // The file is read 256 KiB at a time: names and characters cut by a
-        // read come out whole.
-        // Names of 249 and 139 characters, 4 bytes short of a read.
+        // read come out whole. Long names fill the first read but 4 bytes.
         const QByteArray pad =
             QByteArray(QByteArray(249, 'p') + '\n').repeated(1048) + QByteArray(139, 'q') + '\n';
         const QString pads =
