@@ -262,6 +262,7 @@ private Q_SLOTS:
         row("3 bytes across reads", {pad + "Zo\u20AC\n"}, pads + u"|Zo\u20AC"_s);
         row("4 bytes across reads", {pad + "Zo\U0001F600\n"}, pads + u"|Zo\U0001F600"_s);
         row("a character cut by the end", {"Ann\nZo\xC3"}, u"Ann|Zo\uFFFD"_s);
+        row("nothing but a cut character", {"\xC3"}, u"\uFFFD"_s);
         row("a NUL past the start", {start + QByteArray("B\0o\n", 4)},
             (QStringList(17000, u"Ann"_s) << u"Bo"_s).join(u'|'));
         // A read that fails ends the file: the names read before it stay,
