@@ -87,18 +87,17 @@ void verifyOneReport(const FakeDialogs& dialogs, int line, const QString& start)
 enum class Target {
     Regular,
     NewName,
-    Link,           // "link" -> out
-    PlantedLink,    // the same, made by another user in a shared folder
-    ReadOnly,       // out, mode 444, saved by an unprivileged user
-    Fifo,           // a reader takes what is written
-    FifoReaderGone, // the reader leaves before the end
-    NullDevice,     // a character device like /dev/null
-    FullDevice,     // like /dev/full
-    FileSizeLimit,  // the process may write no more than 4 KB to a file
-    DiskFull,       // the folder is a small file system of its own
-    // The same with two rows, that fit: a workbook needs room to be zipped.
-    FewRowsSizeLimit,
-    FewRowsDiskFull,
+    Link,             // "link" -> out
+    PlantedLink,      // the same, made by another user in a shared folder
+    ReadOnly,         // out, mode 444, saved by an unprivileged user
+    Fifo,             // a reader takes what is written
+    FifoReaderGone,   // the reader leaves before the end
+    NullDevice,       // a character device like /dev/null
+    FullDevice,       // like /dev/full
+    FileSizeLimit,    // the process may write no more than 4 KB to a file
+    DiskFull,         // the folder is a small file system of its own
+    FewRowsSizeLimit, // the same two with two rows, which fit: a workbook
+    FewRowsDiskFull,  // still needs the room to be zipped
     Stale,            // temporary files of other processes beside out
     DatabaseRelative, // names.mdb, from the folder itself
     DatabaseLink,     // "link.txt" -> names.mdb
