@@ -76,6 +76,7 @@ private Q_SLOTS:
         row("corrupt", both, kept, kept, notOurs);
         row("empty", both, kept, kept, notOurs);
         row("foreign", user, kept, kept, notOurs);
+        row("foreign columns", user, kept, kept, notOurs);
         // Another program writing for a moment is waited for.
         row("busy", user, u"AL,Bo,Bo,cleo"_s, u"de Vries,Yu"_s);
     }
@@ -97,6 +98,15 @@ private Q_SLOTS:
             sqlite3* other = nullptr;
             sqlite3_open(QFile::encodeName(m_path).constData(), &other);
             QCOMPARE(sqlite3_exec(other, "create table t (x)", nullptr, nullptr, nullptr), 0);
+            sqlite3_close(other);
+        }
+        if (database == "foreign columns") { // the lists' tables, as another program made them
+            QVERIFY(db.remove());
+            sqlite3* other = nullptr;
+            sqlite3_open(QFile::encodeName(m_path).constData(), &other);
+            QCOMPARE(sqlite3_exec(other, "create table user_firstname (name)", nullptr, nullptr,
+                                  nullptr),
+                     0);
             sqlite3_close(other);
         }
         std::optional<Connection> writer;

@@ -1,6 +1,7 @@
 // Importing names from text files: how a file's bytes become names, what
 // the user is told, and that no file, however strange, harms the database.
 #include "app/listeditor.h"
+#include "names/listoperations.h"
 #include "names/namelists.h"
 #include "names/namesplitter.h"
 #include "support/fakepointer.h"
@@ -10,11 +11,16 @@
 #include <QRandomGenerator>
 #include <QTest>
 
+#include <dlfcn.h>
 #include <sqlite3.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
+#include <sys/types.h>
 #include <unistd.h>
 
+#include <cerrno>
 #include <csignal>
+#include <optional>
 
 using namespace Qt::StringLiterals;
 
@@ -140,24 +146,55 @@ void install()
 
 } // namespace FaultyDisk
 
+// A disk that fails the n-th read of one file with an I/O error once armed.
+namespace FaultyRead {
+ino_t file = 0; // 0: none
+int readsToFail = 0;
+} // namespace FaultyRead
+
 } // namespace
+
+// Every read of the process passes here, the program's reads of the file it
+// imports among them.
+extern "C" ssize_t read(int fd, void* data, size_t size)
+{
+    static const auto system =
+        reinterpret_cast<ssize_t (*)(int, void*, size_t)>(dlsym(RTLD_NEXT, "read"));
+    struct stat info {};
+    if (FaultyRead::file != 0 && ::fstat(fd, &info) == 0 && info.st_ino == FaultyRead::file
+        && --FaultyRead::readsToFail == 0) {
+        errno = EIO;
+        return -1;
+    }
+    return system(fd, data, size);
+}
 
 class TestImport : public QObject {
     Q_OBJECT
 
+    // A names database without names: copied faster than the shipped one,
+    // and the user list reads the same from it.
+    QTemporaryDir m_fixtures;
+    const QString m_empty = m_fixtures.filePath(u"names.mdb"_s);
+
 private Q_SLOTS:
+    void initTestCase() { createEmptyDatabase(m_empty); }
+
     void importing_data()
     {
         // The files in the dialog's order, a null one missing; the names as stored,
         // joined by '|' (null: see below); the reports; what a second connection
-        // to the database does first and holds meanwhile.
+        // to the database does first and holds meanwhile; which read of the
+        // first file fails (0: none).
         QTest::addColumn<QList<QByteArray>>("files");
         QTest::addColumn<QString>("names");
         QTest::addColumn<QStringList>("reports");
         QTest::addColumn<QByteArray>("other");
+        QTest::addColumn<int>("failingRead");
         const auto row = [](const char* tag, const QList<QByteArray>& files, const QString& names,
-                            const QStringList& reports = {}, const QByteArray& other = {}) {
-            QTest::newRow(tag) << files << names << reports << other;
+                            const QStringList& reports = {}, const QByteArray& other = {},
+                            int failingRead = 0) {
+            QTest::newRow(tag) << files << names << reports << other << failingRead;
         };
         // In the reports, %1 stands for the test's folder.
         const QString at = u"in Tessmark.Main.FileToListview "_s;
@@ -213,6 +250,68 @@ private Q_SLOTS:
         // once, and the reports are bounded.
         row("across reads", {QByteArray("\xC3\xAB\n").repeated(100000)}, {});
         row("a 20 MB line", {QByteArray(20 << 20, 'z') + "\nAfter"}, {});
+        // The file is read 256 KiB at a time: names and characters cut by a
+        // read come out whole. Long names fill the first read but 4 bytes.
+        const QByteArray pad =
+            QByteArray(QByteArray(249, 'p') + '\n').repeated(1048) + QByteArray(139, 'q') + '\n';
+        const QString pads =
+            (QStringList(1048, QString(249, u'p')) << QString(139, u'q')).join(u'|');
+        row("a line ending with the read", {pad + "Ann\nBo"}, pads + u"|Ann|Bo"_s);
+        row("a name across reads", {pad + "Annabel\nBo"}, pads + u"|Annabel|Bo"_s);
+        row("CR LF across reads", {pad + "Ann\r\nBo"}, pads + u"|Ann|Bo"_s);
+        row("3 bytes across reads", {pad + "Zo\u20AC\n"}, pads + u"|Zo\u20AC"_s);
+        row("4 bytes across reads", {pad + "Zo\U0001F600\n"}, pads + u"|Zo\U0001F600"_s);
+        row("a character cut by the end", {"Ann\nZo\xC3"}, u"Ann|Zo\uFFFD"_s);
+        row("nothing but a cut character", {"\xC3"}, u"\uFFFD"_s);
+        row("a NUL past the start", {start + QByteArray("B\0o\n", 4)},
+            (QStringList(17000, u"Ann"_s) << u"Bo"_s).join(u'|'));
+        // A read that fails ends the file: the names read before it stay,
+        // the one it cut is not stored.
+        const auto unread = [&](const char* tag, const QByteArray& file, const QString& names,
+                                int read) {
+            row(tag, {file}, names,
+                {errorReportText(u"The file %1/0.txt could not be read to its end: Input/output "
+                                 u"error"_s,
+                                 at, 40, Long)},
+                {}, read);
+        };
+        unread("a read error at the start", "Ann\nBo\n", u""_s, 1);
+        unread("a read error mid-file", pad + "Ann\nBo\nCy", pads + u"|Ann"_s, 2);
+        unread("a read error cutting a name", pad + "Annabel\nBo", pads, 2);
+        // 255 characters (UTF-16 code units) at most, however many bytes.
+        const auto longest = [&](const QString& name) {
+            return refused(u"The name \"%1...\" is longer than 255 characters and was not "
+                           u"stored."_s.arg(name.left(40)));
+        };
+        const QString x254(254, u'x'), e255(255, u'\u00EB'), e256(256, u'\u00EB');
+        const QString emoji127 = QString(u"\U0001F600"_s).repeated(127);
+        row("254, 255 and 256 characters",
+            {(x254 + u"\n"_s + x254 + u"y\n"_s + x254 + u"yz\nBo"_s).toUtf8()},
+            x254 + u'|' + x254 + u"y|Bo"_s, {longest(x254)});
+        row("255 and 256 two-byte characters", {(e255 + u'\n' + e256).toUtf8()}, e255,
+            {longest(e256)});
+        row("255 code units in 128 characters", {(u"a"_s + emoji127 + u"\nBo"_s).toUtf8()},
+            u"a"_s + emoji127 + u"|Bo"_s);
+        row("256 code units", {(emoji127 + u"\U0001F600"_s).toUtf8()}, u""_s,
+            {longest(emoji127.left(40))});
+        row("255 after the apostrophes", {(x254 + u"'y'\n"_s).toUtf8()}, x254 + u'y');
+        // Ten reports of refused names at most, then one of how many more.
+        const QByteArray refuseBad =
+            "create trigger refuse before insert on user_firstname when new.firstname = 'Bad' "
+            "begin select raise(abort, 'no'); end";
+        const auto bad = [](int count) -> QByteArray {
+            return "Ann\n" + QByteArray("Bad\n").repeated(count) + "Cy";
+        };
+        row("9 refused", {bad(9)}, u"Ann|Cy"_s, QStringList(9, refused(u"no"_s)), refuseBad);
+        row("10 refused", {bad(10)}, u"Ann|Cy"_s, QStringList(10, refused(u"no"_s)), refuseBad);
+        row("11 refused", {bad(11)}, u"Ann|Cy"_s,
+            QStringList(10, refused(u"no"_s))
+                << errorReportText(u"1 more name of this file was not stored."_s, at, 60, Long),
+            refuseBad);
+        // A rule that undoes the whole transaction ends the import: nothing stays.
+        row("a rule that rolls back", {"Ann\nBad\nCy"}, u""_s,
+            {errorReportText(u"%1/names.mdb: no"_s, at, 50, Long)},
+            QByteArray(refuseBad).replace("abort", "rollback"));
     }
 
     void importing()
@@ -221,7 +320,7 @@ private Q_SLOTS:
         QFETCH(QString, names);
         QFETCH(QStringList, reports);
         QFETCH(QByteArray, other);
-        Rig rig;
+        Rig rig(m_empty);
         sqlite3* second = nullptr;
         sqlite3_open(QFile::encodeName(rig.db).constData(), &second);
         QCOMPARE(sqlite3_exec(second, other.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
@@ -233,7 +332,14 @@ private Q_SLOTS:
             paths += file.fileName();
         }
         rig.env.dialogs.answerOpen(paths);
+        QFETCH(int, failingRead);
+        struct stat info {};
+        FaultyRead::file =
+            failingRead && ::stat(QFile::encodeName(paths[0]).constData(), &info) == 0 ? info.st_ino
+                                                                                       : 0;
+        FaultyRead::readsToFail = failingRead;
         rig.editor.PushButton6_Click();
+        FaultyRead::file = 0;
         sqlite3_close(second);
 
         const QStringList stored = rig.firstNames();
@@ -254,18 +360,73 @@ private Q_SLOTS:
         rig.lists.RefreshLists(rig.choice);
     }
 
+    // What importNameFile tells its caller of a file or a database that
+    // cannot be opened, and of a choice with no list: nothing is stored.
+    void problemsBeforeTheFirstName_data()
+    {
+        QTest::addColumn<QString>("path");  // in the test's folder, or absolute
+        QTest::addColumn<bool>("database"); // there is one
+        QTest::addColumn<ListChoice>("choice");
+        QTest::addColumn<QStringList>("problems"); // step, culprit: description
+        const ListChoice user{false, true, true, false, false},
+            none{false, false, true, false, false};
+        const QString notAFile = u"%1 is not a file that names can be read from."_s;
+        QTest::newRow("missing") << u"missing.txt"_s << true << user
+                                 << QStringList{u"0 1: File not found"_s};
+        QTest::newRow("a folder") << u"folder"_s << true << user
+                                  << QStringList{u"2 1: "_s + notAFile.arg(u"%1/folder"_s)};
+        QTest::newRow("a FIFO") << u"fifo"_s << true << user
+                                << QStringList{u"2 1: "_s + notAFile.arg(u"%1/fifo"_s)};
+        // Write-only, even for root.
+        QTest::newRow("unreadable") << u"/proc/sys/vm/drop_caches"_s << true << user
+                                    << QStringList{u"2 1: The file /proc/sys/vm/drop_caches "
+                                                   u"cannot be read: Permission denied"_s};
+        QTest::newRow("no database") << u"names.txt"_s << false << user
+                                     << QStringList{u"1 2: %1/names.mdb: unable to open "
+                                                    u"database file"_s};
+        QTest::newRow("no list chosen") << u"names.txt"_s << true << none << QStringList();
+    }
+
+    void problemsBeforeTheFirstName()
+    {
+        QFETCH(QString, path);
+        QFETCH(bool, database);
+        QFETCH(ListChoice, choice);
+        QFETCH(QStringList, problems);
+        if (QDir::isAbsolutePath(path) && !QFileInfo::exists(path))
+            QSKIP("This system has no such file.");
+        TestEnvironment env(database);
+        QVERIFY(QDir(env.folder()).mkdir(u"folder"_s));
+        QVERIFY(::mkfifo(QFile::encodeName(env.filePath(u"fifo"_s)).constData(), 0600) == 0);
+        writeBytes(env.filePath(u"names.txt"_s), "Ann\n");
+        std::optional<Connection> connection;
+        QStringList heard;
+        importNameFile([&]() -> Connection& { return connection.emplace(env.databasePath()); },
+                       QDir(env.folder()).filePath(path), ListKind::FirstNames, choice,
+                       [&](const ImportProblem& problem) {
+                           heard += u"%1 %2: %3"_s.arg(int(problem.step))
+                                        .arg(int(problem.culprit))
+                                        .arg(problem.description);
+                       });
+        QCOMPARE(heard, problems.replaceInStrings(u"%1"_s, env.folder()));
+        connection.reset();
+        QVERIFY(!database
+                || tableColumn(env.databasePath(), u"user_firstname"_s, u"*"_s).isEmpty());
+    }
+
     // Every write of a small import, a clear and a delete fails in turn, as
     // SQLite's own tests fail them: the operation is reported once, naming
     // the database, and the database holds what it held before (an import
     // may keep the file's first names, never a later one) and is whole.
     void aFailingWriteLosesNothing_data()
     {
-        QTest::addColumn<int>("button"); // 6 imports, 4 clears or deletes first names
+        QTest::addColumn<int>("button"); // 6 imports, 2 adds, 4 clears or deletes first names
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<QStringList>("after"); // the first names when nothing fails
         const ListChoice user{false, true, true, false, false},
             both{true, false, true, false, false};
         QTest::newRow("import") << 6 << user << QStringList{u"Old"_s, u"Ann"_s, u"Bo"_s, u"Cy"_s};
+        QTest::newRow("add") << 2 << user << QStringList{u"Old"_s, u"Ann"_s};
         QTest::newRow("clear") << 4 << user << QStringList{};
         QTest::newRow("delete") << 4 << both << QStringList{};
     }
@@ -293,10 +454,14 @@ private Q_SLOTS:
             const QString file = rig.env.filePath(u"names.txt"_s);
             writeBytes(file, "Ann\nBo\nCy\n");
             rig.env.dialogs.answerOpen({file});
+            rig.env.dialogs.answerInput(u"Ann"_s);
 
             FaultyDisk::failed = false;
             FaultyDisk::writesToFail = write;
-            button == 6 ? rig.editor.PushButton6_Click() : rig.editor.PushButton4_Click(0);
+            if (button == 2)
+                rig.editor.PushButton2_Click();
+            else
+                button == 6 ? rig.editor.PushButton6_Click() : rig.editor.PushButton4_Click(0);
             FaultyDisk::writesToFail = 0;
 
             const QStringList messages = rig.env.dialogs.messages();
@@ -317,6 +482,100 @@ private Q_SLOTS:
             QCOMPARE(tableColumn(rig.db, male, u"*"_s), QStringList{u"Old"_s});
         }
         QVERIFY(write > 3); // there were writes to fail
+    }
+
+    // A file of 4 MiB or more has its names stored while the list's indexes
+    // are dropped, and the indexes built again at the end: either way the
+    // same names are stored and the same indexes are there afterwards. An
+    // index of another program's function shows which way was taken: a
+    // smaller file cannot begin, a larger one cannot build it again; either
+    // way nothing is stored.
+    void largeFilesKeepTheIndexes_data()
+    {
+        QTest::addColumn<qint64>("size");
+        QTest::addColumn<int>("button"); // 6 first names, 7 last names
+        QTest::addColumn<bool>("user");
+        // Another index of the list: of a function of another program's, or
+        // unique (the file then starts with the name already there).
+        QTest::addColumn<QString>("index");
+        QTest::addColumn<int>("failedStep"); // the one report's; 0: none
+        const qint64 bulk = 4 << 20;
+        const QString none, quill = u"quill"_s, unique = u"unique"_s;
+        QTest::newRow("just below") << bulk - 1 << 6 << true << none << 0;
+        QTest::newRow("at") << bulk << 6 << true << none << 0;
+        QTest::newRow("above, built-in first names") << bulk + 1 << 6 << false << none << 0;
+        QTest::newRow("at, built-in last names") << bulk << 7 << false << none << 0;
+        QTest::newRow("at, user last names") << bulk << 7 << true << none << 0;
+        QTest::newRow("below: no insert can begin") << bulk - 1 << 6 << true << quill << 30;
+        QTest::newRow("at: the rebuild fails") << bulk << 6 << true << quill << 70;
+        QTest::newRow("at: a unique index stays") << bulk << 6 << true << unique << 50;
+    }
+
+    void largeFilesKeepTheIndexes()
+    {
+        QFETCH(qint64, size);
+        QFETCH(int, button);
+        QFETCH(bool, user);
+        QFETCH(QString, index);
+        QFETCH(int, failedStep);
+        const int list = (user ? 3 : 1) + (button == 7); // index into DatabaseTables
+        const QString table = DatabaseTables[list], column = DatabaseColumns[list];
+        TestEnvironment env(false);
+        const QString db = env.databasePath();
+        createEmptyDatabase(db);
+        insertRows(db, table, column, {u"Old"_s});
+        if (!index.isEmpty()) {
+            sqlite3* other = nullptr;
+            sqlite3_open(QFile::encodeName(db).constData(), &other);
+            sqlite3_create_function_v2(
+                other, "quill", 1, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
+                [](sqlite3_context* c, int, sqlite3_value** v) { sqlite3_result_value(c, v[0]); },
+                nullptr, nullptr, nullptr);
+            const QByteArray sql = (index == u"quill" ? u"create index quill on %1 (quill(%2))"_s
+                                                      : u"create unique index once on %1 (%2)"_s)
+                                       .arg(table, column)
+                                       .toUtf8();
+            QCOMPARE(sqlite3_exec(other, sql.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
+            sqlite3_close(other);
+        }
+        const auto schema = [&] {
+            QStringList entries = tableColumn(db, u"sqlite_master"_s, u"name || ifnull(sql, '')"_s);
+            entries.sort();
+            return entries;
+        };
+        const QStringList before = schema();
+        // Lines of 250 bytes, the last one shorter.
+        QByteArray bytes = index == u"unique" ? "Old\n" : "";
+        QStringList names{u"Old"_s};
+        while (bytes.size() < size) {
+            const qint64 left = size - bytes.size();
+            const qint64 line = left >= 500 ? 250 : left >= 250 ? left / 2 : left;
+            names += u"Name%1"_s.arg(names.size()).leftJustified(int(line) - 1, u'x');
+            bytes += names.last().toLatin1() + '\n';
+        }
+        QCOMPARE(bytes.size(), size);
+        writeBytes(env.filePath(u"names.txt"_s), bytes);
+        FakePointer pointer;
+        NameLists lists(db);
+        ListEditor editor(env.dialogs, db, lists, pointer, [&] {
+            return ListChoice{!user, user, true, false, false};
+        });
+        env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
+        button == 6 ? editor.PushButton6_Click() : editor.PushButton7_Click();
+
+        const QStringList messages = env.dialogs.messages();
+        QCOMPARE(messages.size(), failedStep ? 1 : 0);
+        if (failedStep) {
+            QVERIFY2(messages[0].contains(index == u"quill" ? u"function: quill"_s
+                                                            : u"UNIQUE constraint failed"_s),
+                     qPrintable(messages[0]));
+            QVERIFY(messages[0].endsWith(errorReportText({}, u"in Tessmark.Main.FileToListview "_s,
+                                                         failedStep, ClosingLine::Long)));
+        }
+        if (index != u"quill") // another program's function is needed to check that index
+            QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
+        QCOMPARE(tableColumn(db, table, column), index == u"quill" ? QStringList{u"Old"_s} : names);
+        QCOMPARE(schema(), before);
     }
 
     // A full disk or a read-only database, on a small file system of the

@@ -1,12 +1,15 @@
 // Adding, deleting and clearing names by hand: what reaches the tables and
 // the panes, and what the user is told.
 #include "app/form1.h"
+#include "names/listoperations.h"
 #include "support/controls.h"
 #include "support/fakepointer.h"
 #include "support/testenvironment.h"
 
 #include <QAbstractButton>
 #include <QTest>
+
+#include <optional>
 
 using namespace Qt::StringLiterals;
 
@@ -16,6 +19,8 @@ const ListChoice Both{.builtIn = true, .user = false, .both = true, .male = fals
 const ListChoice MaleOnly{
     .builtIn = true, .user = false, .both = false, .male = true, .female = false};
 const ListChoice User{.builtIn = false, .user = true, .both = true, .male = false, .female = false};
+const ListChoice FemaleOnly{
+    .builtIn = true, .user = false, .both = false, .male = false, .female = true};
 const QStringList &Tables = DatabaseTables, &Columns = DatabaseColumns;
 
 QMap<QString, QStringList> snapshot(const QString& db)
@@ -45,7 +50,14 @@ struct Click {
 class TestListEditor : public QObject {
     Q_OBJECT
 
+    // A names database without names, copied for each case that needs one:
+    // faster than making it anew.
+    QTemporaryDir m_fixtures;
+    const QString m_empty = m_fixtures.filePath(u"names.mdb"_s);
+
 private Q_SLOTS:
+    void initTestCase() { createEmptyDatabase(m_empty); }
+
     void clicking_data()
     {
         QTest::addColumn<Click>("c");
@@ -96,6 +108,12 @@ private Q_SLOTS:
         QTest::newRow("none selected, last") << Click{.choice = Both, .button = 3, .reports = {40}};
         QTest::newRow("clear first names, none selected")
             << Click{.choice = User, .button = 4, .tables = {uf}};
+        // The first delete's step fails, and the rest is not tried.
+        QTest::newRow("delete, no database") << Click{.choice = Both,
+                                                      .button = 4,
+                                                      .reports = {10, 20, 70},
+                                                      .closing = Short,
+                                                      .noDatabase = true};
         QTest::newRow("PushButton2")
             << Click{.choice = Both, .button = 2, .reports = {10, 50}, .noDatabase = true};
         QTest::newRow("PushButton5")
@@ -143,6 +161,236 @@ private Q_SLOTS:
         QCOMPARE(QFile::exists(db), !c.noDatabase); // never made anew
         QCOMPARE(pointer.history.contains(MousePointer::Hourglass), refreshes);
         QCOMPARE(pane.names().contains(adding ? c.stored : c.input), c.shown);
+    }
+
+    // Every button of both panes with names in every table: only the tables
+    // it names change (m, f, l: the built-in male, female and last names;
+    // uf, ul: the user's first and last names), and nothing is reported.
+    // Each table holds Ann and Bo; Cy is typed, Bo selected, "Cy Di" imported.
+    void everyButtonWithData_data()
+    {
+        QTest::addColumn<ListChoice>("choice");
+        QTest::addColumn<int>("button");
+        QTest::addColumn<QStringList>("after"); // m, f, l, uf, ul
+        const QString both = u"Ann,Bo"_s, cy = u"Ann,Bo,Cy"_s, cyDi = u"Ann,Bo,Cy,Di"_s;
+        const auto row = [&](const char* tag, ListChoice choice, int button, QString m, QString f,
+                             QString l, QString uf, QString ul) {
+            QTest::newRow(tag) << choice << button << QStringList{m, f, l, uf, ul};
+        };
+        row("user: add first", User, 2, both, both, both, cy, both);
+        row("user: add last", User, 5, both, both, both, both, cy);
+        row("user: clear first", User, 4, both, both, both, u""_s, both);
+        row("user: clear last", User, 3, both, both, both, both, u""_s);
+        row("user: import first", User, 6, both, both, both, cyDi, both);
+        row("user: import last", User, 7, both, both, both, both, cyDi);
+        row("both: add first", Both, 2, both, cy, both, both, both);
+        row("male only: add first", MaleOnly, 2, both, cy, both, both, both);
+        row("both: add last", Both, 5, both, both, cy, both, both);
+        row("both: delete first", Both, 4, u"Ann"_s, u"Ann"_s, both, both, both);
+        row("male only: delete first", MaleOnly, 4, u"Ann"_s, both, both, both, both);
+        row("female only: delete first", FemaleOnly, 4, both, u"Ann"_s, both, both, both);
+        row("both: delete last", Both, 3, both, both, u"Ann"_s, both, both);
+        row("male only: import first", MaleOnly, 6, both, cyDi, both, both, both);
+        row("female only: import last", FemaleOnly, 7, both, both, cyDi, both, both);
+    }
+
+    void everyButtonWithData()
+    {
+        QFETCH(ListChoice, choice);
+        QFETCH(int, button);
+        TestEnvironment env(false);
+        FakePointer pointer;
+        const QString db = env.databasePath();
+        QVERIFY(QFile::copy(m_empty, db));
+        for (qsizetype t = 0; t < Tables.size(); ++t)
+            insertRows(db, Tables[t], Columns[t], {u"Ann"_s, u"Bo"_s});
+        writeBytes(env.filePath(u"names.txt"_s), "Cy\nDi\n");
+        NameLists lists(db);
+        lists.RefreshLists(choice);
+        ListEditor editor(env.dialogs, db, lists, pointer, [&] { return choice; });
+        env.dialogs.answerInput(u"Cy"_s);
+        env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
+        const int first = int(lists.firstPane().names().indexOf(u"Bo"_s));
+        const int last = int(lists.lastPane().names().indexOf(u"Bo"_s));
+        switch (button) {
+        case 2:
+            editor.PushButton2_Click();
+            break;
+        case 5:
+            editor.PushButton5_Click();
+            break;
+        case 4:
+            editor.PushButton4_Click(first);
+            break;
+        case 3:
+            editor.PushButton3_Click(last);
+            break;
+        case 6:
+            editor.PushButton6_Click();
+            break;
+        case 7:
+            editor.PushButton7_Click();
+            break;
+        }
+        QCOMPARE(env.dialogs.messages(), QStringList());
+        QStringList tables;
+        for (qsizetype t = 0; t < Tables.size(); ++t)
+            tables += tableColumn(db, Tables[t], Columns[t]).join(u',');
+        QTEST(tables, "after");
+    }
+
+    // Typed names, all of them or none: every one is checked before the
+    // list changes. 255 characters (UTF-16 code units) at most, counted
+    // after the apostrophes go.
+    void addingSeveralNames_data()
+    {
+        QTest::addColumn<QStringList>("typed");
+        QTest::addColumn<ListChoice>("choice");
+        QTest::addColumn<QString>("stored"); // user_lastname afterwards, joined by '|'
+        QTest::addColumn<QString>("failure");
+        QTest::addColumn<bool>("joined"); // to the caller's transaction, which it rolls back
+        const QString x254(254, u'x'), e255(255, u'\u00EB'), e256(256, u'\u00EB');
+        const QString a127 = u"a"_s + QString(u"\U0001F600"_s).repeated(127);
+        const auto tooLong = [](const QString& name) {
+            return u"The name \"%1...\" is longer than 255 characters and was not stored."_s.arg(
+                name.left(40));
+        };
+        const auto row = [](const char* tag, const QStringList& typed, const QString& stored,
+                            const QString& failure = {}, ListChoice choice = User,
+                            bool joined = false) {
+            QTest::newRow(tag) << typed << choice << stored << failure << joined;
+        };
+        row("254 and 255 characters", {x254, x254 + u'y'}, u"Old|"_s + x254 + u'|' + x254 + u'y');
+        row("256 characters", {u"Ann"_s, x254 + u"yz"_s}, u"Old"_s, tooLong(x254));
+        row("255 two-byte characters", {e255}, u"Old|"_s + e255);
+        row("256 two-byte characters", {e256}, u"Old"_s, tooLong(e256));
+        row("255 code units in 128 characters", {a127}, u"Old|"_s + a127);
+        row("256 code units", {a127 + u'b'}, u"Old"_s, tooLong(a127));
+        row("255 once the apostrophes go", {x254 + u"'y'"_s}, u"Old|"_s + x254 + u'y');
+        row("a CR", {u"Ann"_s, u"Ann\rLee"_s}, u"Old"_s,
+            u"The name \"Ann\\rLee\" holds a control character and was not stored."_s);
+        row("a line separator", {u"Ann\u2028Lee"_s}, u"Old"_s,
+            u"The name \"Ann\\u2028Lee\" holds a control character and was not stored."_s);
+        row("a rule refuses the second", {u"Ann"_s, u"Bad"_s, u"Bo"_s}, u"Old"_s, u"no"_s);
+        row("a blank one", {u"Ann"_s, u"  "_s}, u"Old"_s,
+            u"The name \"  \" is blank: nothing was added."_s);
+        row("a paragraph separator", {u"Ann\u2029Lee"_s}, u"Old"_s,
+            u"The name \"Ann\\u2029Lee\" holds a control character and was not stored."_s);
+        row("no source chosen", {u"Ann"_s, u"  "_s}, u"Old"_s, {}, ListChoice{.builtIn = false});
+        row("joined to the caller's", {u"Ann"_s}, u"Old"_s, {}, User, true);
+    }
+
+    void addingSeveralNames()
+    {
+        QFETCH(QStringList, typed);
+        QFETCH(ListChoice, choice);
+        QTemporaryDir folder;
+        const QString db = folder.filePath(u"names.mdb"_s);
+        QVERIFY(QFile::copy(m_empty, db));
+        insertRows(db, u"user_lastname"_s, u"lastname"_s, {u"Old"_s});
+        const QMap<QString, QStringList> others = snapshot(db);
+        std::optional<Connection> connection;
+        connection.emplace(db).execute(
+            "create trigger refuse before insert on user_lastname when new.lastname = 'Bad' "
+            "begin select raise(abort, 'no'); end");
+        QFETCH(bool, joined);
+        std::optional<Connection::Transaction> callers;
+        if (joined)
+            callers.emplace(*connection);
+        QString failure;
+        try {
+            addNames([&]() -> Connection& { return *connection; }, ListKind::LastNames, choice,
+                     typed, BlankNames::Refuse);
+        } catch (const Failure& f) {
+            failure = f.description();
+        }
+        QCOMPARE(connection->inTransaction(), joined);
+        callers.reset();
+        connection.reset();
+        QTEST(failure, "failure");
+        QTEST(tableColumn(db, u"user_lastname"_s, u"*"_s).join(u'|'), "stored");
+        QMap<QString, QStringList> all = snapshot(db);
+        all[u"user_lastname"_s] = others[u"user_lastname"_s];
+        QCOMPARE(all, others);
+    }
+
+    // Deleting first names from the built-in list: all of them or, when a
+    // failure ends the delete, none; a step that traps a refused statement
+    // goes on with the next, unless the refusal undid the transaction.
+    void deletingNames_data()
+    {
+        QTest::addColumn<ListChoice>("choice");
+        QTest::addColumn<QStringList>("names");
+        QTest::addColumn<bool>("refuseAbsent");
+        QTest::addColumn<QByteArray>("rule"); // how a rule refuses deleting the male Bo
+        QTest::addColumn<bool>("trapped");
+        QTest::addColumn<QStringList>("after"); // the male and female first names
+        QTest::addColumn<QStringList>("failures");
+        const ListChoice noGender{.both = false};
+        const QString both = u"Ann,Bo"_s, ann = u"Ann"_s;
+        const QStringList bo{u"Bo"_s}, boZed{u"Bo"_s, u"Zed"_s}, no{u"no"_s};
+        const auto row = [](const char* tag, ListChoice choice, const QStringList& names,
+                            bool refuseAbsent, const char* rule, bool trapped, QString m, QString f,
+                            const QStringList& failures = {}) {
+            QTest::newRow(tag) << choice << names << refuseAbsent << QByteArray(rule) << trapped
+                               << QStringList{m, f} << failures;
+        };
+        row("no gender chosen", noGender, bo, true, "", false, both, both);
+        row("no names", Both, {}, true, "", false, both, both);
+        row("an absent name ignored", Both, boZed, false, "", false, ann, ann);
+        row("an absent name refused", Both, boZed, true, "", false, both, both,
+            {u"\"Zed\" is not in the list: nothing was deleted."_s});
+        row("refused", Both, bo, false, "abort", false, both, both, no);
+        row("refused, trapped", Both, bo, false, "abort", true, both, ann, no);
+        row("undone, trapped", Both, bo, false, "rollback", true, both, both, no);
+    }
+
+    void deletingNames()
+    {
+        QFETCH(ListChoice, choice);
+        QFETCH(QStringList, names);
+        QFETCH(bool, refuseAbsent);
+        QFETCH(QByteArray, rule);
+        QFETCH(bool, trapped);
+        QTemporaryDir folder;
+        const QString db = folder.filePath(u"names.mdb"_s);
+        QVERIFY(QFile::copy(m_empty, db));
+        for (qsizetype t = 0; t < Tables.size(); ++t)
+            insertRows(db, Tables[t], Columns[t], {u"Ann"_s, u"Bo"_s});
+        std::optional<Connection> connection;
+        connection.emplace(db);
+        if (!rule.isEmpty())
+            connection->execute(QByteArray("create trigger refuse before delete on "
+                                           "system_mfirstname when old.Mfirst = 'Bo' begin "
+                                           "select raise("
+                                           + rule + ", 'no'); end")
+                                    .constData());
+        const QMap<QString, QStringList> before = snapshot(db);
+        QStringList failures;
+        const StatementStep trap = [&](const char*, const std::function<void()>& work) {
+            try {
+                work();
+                return true;
+            } catch (const Failure& f) {
+                failures += f.description();
+                return false;
+            }
+        };
+        try {
+            ::deleteNames([&]() -> Connection& { return *connection; }, ListKind::FirstNames,
+                          choice, names, refuseAbsent ? AbsentNames::Refuse : AbsentNames::Ignore,
+                          trapped ? trap : StatementStep());
+        } catch (const Failure& f) {
+            failures += f.description();
+        }
+        QVERIFY(!connection->inTransaction());
+        connection.reset();
+        QTEST(failures, "failures");
+        QMap<QString, QStringList> all = snapshot(db);
+        QTEST((QStringList{all.take(Tables[0]).join(u','), all.take(Tables[1]).join(u',')}),
+              "after");
+        for (const QString& table : all.keys())
+            QCOMPARE(all[table], before[table]);
     }
 
     void theWindowsButtonsEditTheLists()

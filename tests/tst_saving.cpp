@@ -13,10 +13,12 @@
 #include "support/fakeplatform.h"
 #include "support/workbook.h"
 
+#include <QDateTime>
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
 #include <QProcess>
+#include <QRegularExpression>
 #include <QTemporaryDir>
 #include <QTemporaryFile>
 #include <QTest>
@@ -94,6 +96,8 @@ enum class Target {
     FullDevice,       // like /dev/full
     FileSizeLimit,    // the process may write no more than 4 KB to a file
     DiskFull,         // the folder is a small file system of its own
+    FewRowsSizeLimit, // the same two with two rows, which fit: a workbook
+    FewRowsDiskFull,  // still needs the room to be zipped
     Stale,            // temporary files of other processes beside out
     DatabaseRelative, // names.mdb, from the folder itself
     DatabaseLink,     // "link.txt" -> names.mdb
@@ -282,6 +286,41 @@ private Q_SLOTS:
         QCOMPARE(layout(ListRows(byName)), bytes);
     }
 
+    // The results list as a view reads and edits it: the first name alone
+    // is retyped in place, and retyping it as it was changes nothing, so
+    // the rows are still saved from names encoded once.
+    void theResultsListAsAViewSeesIt()
+    {
+        ResultsModel model;
+        model.addColumn(u"First"_s);
+        model.addColumn(u"Last"_s);
+        GeneratedNames generated;
+        generated.firstNames = QStringList{u"Ann"_s};
+        generated.lastNames = QStringList{u"Lee"_s};
+        generated.rows = {{0, 0}};
+        model.setRows(generated);
+        const QModelIndex first = model.index(0, 0), last = model.index(0, 1), none;
+        QCOMPARE(model.data(first, Qt::EditRole), QVariant(u"Ann"_s));
+        QCOMPARE(model.data(last, Qt::DisplayRole), QVariant(u"Lee"_s));
+        QCOMPARE(model.data(first, Qt::ToolTipRole), QVariant());
+        QCOMPARE(model.data(none, Qt::DisplayRole), QVariant());
+        QCOMPARE(model.rowCount(first) + model.columnCount(first), 0);
+        QCOMPARE(model.firstName(1) + model.firstName(-1) + model.lastName(1), QString());
+        QCOMPARE(model.headerData(1, Qt::Horizontal, Qt::DisplayRole), QVariant(u"Last"_s));
+        QCOMPARE(model.headerData(2, Qt::Horizontal, Qt::DisplayRole), QVariant());
+        QCOMPARE(model.headerData(0, Qt::Vertical, Qt::DisplayRole), QVariant());
+        QVERIFY(model.flags(first) & Qt::ItemIsEditable);
+        QVERIFY(!(model.flags(last) & Qt::ItemIsEditable));
+        QCOMPARE(model.flags(none), Qt::NoItemFlags);
+        QVERIFY(!model.setData(last, u"Bo"_s, Qt::EditRole));
+        QVERIFY(!model.setData(first, u"Bo"_s, Qt::DisplayRole));
+        QVERIFY(model.setData(first, u"Ann"_s, Qt::EditRole));
+        QVERIFY(model.indexedNames());
+        QVERIFY(model.setData(first, u"Bo"_s, Qt::EditRole));
+        QVERIFY(!model.indexedNames());
+        QCOMPARE(resultsText(model), QByteArray("Bo Lee\r\n"));
+    }
+
     // A field is quoted, its quotes doubled, where a CSV reader would split
     // it: at a comma, a quote, and either half of a line end. Rows kept as
     // indices and rows kept by name alike.
@@ -339,6 +378,10 @@ private Q_SLOTS:
             row("device full", Target::FullDevice, u"No space left on device"_s);
             row("file size limit", Target::FileSizeLimit, u"File too large"_s);
             row("disk full", Target::DiskFull, u"No space left on device"_s);
+            row("file size limit, two rows", Target::FewRowsSizeLimit,
+                workbook ? u"File too large"_s : QString());
+            row("disk full, two rows", Target::FewRowsDiskFull,
+                workbook ? u"No space left on device"_s : QString());
             row("stale temporary files", Target::Stale, {});
             row("database, relative", Target::DatabaseRelative, NamesDatabase);
             row("database, link", Target::DatabaseLink, NamesDatabase);
@@ -367,7 +410,7 @@ private Q_SLOTS:
                     ::umount2(at.constData(), MNT_DETACH);
             }
         } unmount;
-        if (target == Target::DiskFull) {
+        if (target == Target::DiskFull || target == Target::FewRowsDiskFull) {
             if (!root)
                 QSKIP("Only root mounts a small file system.");
             const QByteArray at = QFile::encodeName(dir.path());
@@ -487,7 +530,7 @@ private Q_SLOTS:
         QString failure;
         if (target == Target::ReadOnly) {
             failure = asNobody(save);
-        } else if (target == Target::FileSizeLimit) {
+        } else if (target == Target::FileSizeLimit || target == Target::FewRowsSizeLimit) {
             // The signal as a program gets it: it must not end the program.
             const rlimit small{4096, RLIM_INFINITY}, unlimited{RLIM_INFINITY, RLIM_INFINITY};
             std::signal(SIGXFSZ, SIG_DFL);
@@ -520,7 +563,8 @@ private Q_SLOTS:
         };
         const bool replaced =
             error.isEmpty()
-            && (target == Target::Regular || target == Target::Link || target == Target::Stale);
+            && (target == Target::Regular || target == Target::Link || target == Target::Stale
+                || target == Target::FewRowsSizeLimit || target == Target::FewRowsDiskFull);
         QVERIFY(replaced ? holdsTheRows(out) : readAll(out) == "old");
         QCOMPARE(modeOf(out) & 0777, target == Target::ReadOnly ? 0444u : 0640u);
         QCOMPARE(readAll(database), QByteArray("names"));
@@ -546,6 +590,209 @@ private Q_SLOTS:
         left.sort();
         QCOMPARE(left, (target == Target::Stale ? QStringList{fresh, notOurs} : QStringList()));
         QCOMPARE(entries(dir.filePath(u"tmp"_s)), QStringList());
+    }
+
+    // A workbook that cannot be made or filled whole is neither handed to
+    // the desktop nor left in the cache folder: one report, at the step that
+    // failed.
+    void aWorkbookThatFailsIsNotShown_data()
+    {
+        QTest::addColumn<OutputChoice>("choice");
+        QTest::addColumn<Names>("names");
+        QTest::addColumn<bool>("cacheIsAFile");
+        QTest::addColumn<int>("line");
+        QTest::addColumn<QString>("report");
+        const auto two = OutputChoice::SpreadsheetTwoCells, one = OutputChoice::SpreadsheetOneCell;
+        const QString tooLong = u"String exceeds Excel's limit of 32,767 characters."_s;
+        // A first name retyped in the results list may be longer than a cell holds.
+        const Names long2{{u"Ann"_s, u"Lee"_s}, {QString(32768, u'x'), u"Lee"_s}, AnnBob[1]};
+        const Names long1{{u"Ann"_s, u"Lee"_s}, {QString(32764, u'x'), u"Lee"_s}, AnnBob[1]};
+        QTest::newRow("a cell too long, 2 cells")
+            << two << long2 << false << 130 << tooLong + u" (cell A2)"_s;
+        QTest::newRow("a cell too long, 1 cell")
+            << one << long1 << false << 130 << tooLong + u" (cell A2)"_s;
+        QTest::newRow("no cache folder") << two << AnnBob << true << 110 << u"The folder "_s;
+    }
+
+    void aWorkbookThatFailsIsNotShown()
+    {
+        QFETCH(OutputChoice, choice);
+        QFETCH(Names, names);
+        QFETCH(bool, cacheIsAFile);
+        QFETCH(int, line);
+        QFETCH(QString, report);
+        QTemporaryDir dir;
+        writeFile(dir.filePath(u"file"_s), "file");
+        const QString cache = dir.filePath(cacheIsAFile ? u"file/cache"_s : u"cache"_s);
+        FakeDialogs dialogs;
+        FakeShell shell;
+        ResultsSaver(dialogs, shell, cache).save(choice, ListRows(names));
+        verifyOneReport(dialogs, line, report);
+        QCOMPARE(shell.documents, QStringList());
+        const QStringList left =
+            cacheIsAFile ? QStringList{u"file"_s} : QStringList{u"cache"_s, u"file"_s};
+        QCOMPARE(entries(dir.path()), left);
+        QCOMPARE(entries(cache), QStringList());
+    }
+
+    // The sheet's limits: 1,048,576 rows, 16,384 columns (XFD), 32,767
+    // characters in a cell. A cell past them is refused, naming the cell.
+    void cellsAtTheSheetsLimits_data()
+    {
+        QTest::addColumn<int>("row");
+        QTest::addColumn<int>("column");
+        QTest::addColumn<int>("length");
+        QTest::addColumn<QString>("error");
+        const QString outside = u"Worksheet row or column index out of range. (cell %1)"_s;
+        const QString tooLong = u"String exceeds Excel's limit of 32,767 characters. (cell A1)"_s;
+        QTest::newRow("the last row") << 1048576 << 1 << 3 << QString();
+        QTest::newRow("past the last row") << 1048577 << 1 << 3 << outside.arg(u"A1048577"_s);
+        QTest::newRow("the last column") << 1 << 16384 << 3 << QString();
+        QTest::newRow("past the last column") << 1 << 16385 << 3 << outside.arg(u"XFE1"_s);
+        QTest::newRow("row 0") << 0 << 1 << 3 << u"There is no cell at row 0, column 1"_s;
+        QTest::newRow("column 0") << 1 << 0 << 3 << u"There is no cell at row 1, column 0"_s;
+        QTest::newRow("32,767 characters") << 1 << 1 << 32767 << QString();
+        QTest::newRow("32,768 characters") << 1 << 1 << 32768 << tooLong;
+    }
+
+    void cellsAtTheSheetsLimits()
+    {
+        QFETCH(int, row);
+        QFETCH(int, column);
+        QFETCH(int, length);
+        QTemporaryDir dir;
+        const QString path = dir.filePath(u"out.xlsx"_s);
+        QString error;
+        try {
+            WorkbookFile book(std::make_unique<SafeFile>(path));
+            book.sheet().cells(row, column) = QString(length, u'x');
+            book.save();
+        } catch (const Failure& failure) {
+            error = failure.description();
+        }
+        QTEST(error, "error");
+        QCOMPARE(entries(dir.path()), error.isEmpty() ? QStringList{u"out.xlsx"_s} : QStringList());
+    }
+
+    // What a caller of the workbook and the spreadsheet sees when it calls
+    // them out of turn, or when the folder goes away before the end.
+    void workbookCallsOutOfTurn_data()
+    {
+        QTest::addColumn<QStringList>("calls");
+        QTest::addColumn<QString>("error");
+        QTest::addColumn<int>("documents"); // handed to the desktop
+        QTest::newRow("add, fill, show")
+            << QStringList{u"add"_s, u"fill"_s, u"show"_s} << QString() << 1;
+        QTest::newRow("show twice, hide")
+            << QStringList{u"add"_s, u"show"_s, u"show"_s, u"hide"_s} << QString() << 1;
+        QTest::newRow("two workbooks") << QStringList{u"add"_s, u"add"_s}
+                                       << u"The spreadsheet already holds a workbook"_s << 0;
+        QTest::newRow("a sheet before add")
+            << QStringList{u"fill"_s} << u"There is no workbook"_s << 0;
+        QTest::newRow("show before add")
+            << QStringList{u"show"_s} << u"There is no workbook to show"_s << 0;
+        QTest::newRow("add after show") << QStringList{u"add"_s, u"show"_s, u"add"_s}
+                                        << u"The spreadsheet already holds a workbook"_s << 1;
+        QTest::newRow("the folder goes away")
+            << QStringList{u"add"_s, u"fill"_s, u"remove"_s, u"show"_s}
+            << u"could not be saved: No such file or directory"_s << 0;
+    }
+
+    void workbookCallsOutOfTurn()
+    {
+        QFETCH(QStringList, calls);
+        QTemporaryDir dir;
+        const QString folder = dir.filePath(u"cache"_s);
+        FakeShell shell;
+        QString failure;
+        try {
+            SpreadsheetApplication spreadsheet(shell, folder);
+            for (const QString& call : std::as_const(calls)) {
+                if (call == u"add")
+                    spreadsheet.Workbooks().Add();
+                else if (call == u"fill")
+                    spreadsheet.ActiveWorkbook().ActiveSheet().cells(1, 1) = u"Ann"_s;
+                else if (call == u"remove")
+                    QDir(folder).removeRecursively();
+                else
+                    spreadsheet.setVisible(call == u"show");
+            }
+        } catch (const Failure& f) {
+            failure = f.description();
+        }
+        QFETCH(QString, error);
+        QVERIFY2(error.isEmpty() ? failure.isEmpty() : failure.endsWith(error),
+                 qPrintable(failure));
+        QTEST(int(shell.documents.size()), "documents");
+        QCOMPARE(entries(folder).size(), qsizetype(shell.documents.size()));
+    }
+
+    // A workbook is never given the name of a file that is there: one made
+    // in the same second as others is told apart by a number, up to 1000.
+    void aWorkbookNeverReplacesAFile_data()
+    {
+        QTest::addColumn<int>("taken");    // workbooks of this second already there
+        QTest::addColumn<QString>("name"); // after the second; empty: refused
+        QTest::newRow("none") << 0 << u".xlsx"_s;
+        QTest::newRow("one") << 1 << u" (2).xlsx"_s;
+        QTest::newRow("999") << 999 << u" (1000).xlsx"_s;
+        QTest::newRow("1000") << 1000 << QString();
+    }
+
+    void aWorkbookNeverReplacesAFile()
+    {
+        QFETCH(int, taken);
+        QFETCH(QString, name);
+        // Thousands of names come and go much faster in memory, where a
+        // file system there can be written.
+        const bool inMemory = QFileInfo(u"/dev/shm"_s).isWritable();
+        QTemporaryDir temporary((inMemory ? u"/dev/shm"_s : QDir::tempPath())
+                                + u"/quillane-XXXXXX"_s);
+        QDir dir;
+        // This second's and the next's, whichever the workbook is made in;
+        // once more in a new folder when making them took longer than that.
+        for (int attempt = 0;; ++attempt) {
+            QVERIFY(attempt < 10);
+            dir.setPath(temporary.filePath(QString::number(attempt)));
+            QVERIFY(dir.mkpath(u"."_s));
+            const QDateTime now = QDateTime::currentDateTime();
+            for (const QDateTime& moment : {now, now.addSecs(1)}) {
+                const QString stem = moment.toString(u"'Quillane names 'yyyy-MM-dd HH.mm.ss"_s);
+                // A file, then links to nothing, which are names taken all the same.
+                if (taken > 0)
+                    writeFile(dir.filePath(stem + u".xlsx"_s), "theirs");
+                for (int n = 2; n <= taken; ++n)
+                    QVERIFY(::symlink(
+                                "theirs",
+                                QFile::encodeName(dir.filePath(u"%1 (%2).xlsx"_s.arg(stem).arg(n)))
+                                    .constData())
+                            == 0);
+            }
+            if (QDateTime::currentSecsSinceEpoch() <= now.toSecsSinceEpoch() + 1)
+                break;
+        }
+        FakeShell shell;
+        SpreadsheetApplication spreadsheet(shell, dir.path());
+        QString failure;
+        try {
+            spreadsheet.Workbooks().Add();
+            spreadsheet.setVisible(true);
+        } catch (const Failure& f) {
+            failure = f.description();
+        }
+        if (name.isEmpty()) {
+            QCOMPARE(failure,
+                     u"The folder %1 holds too many workbooks of this second"_s.arg(dir.path()));
+            QCOMPARE(shell.documents, QStringList());
+        } else {
+            const QRegularExpression named(u"/Quillane names [0-9. -]{19}"_s
+                                           + QRegularExpression::escape(name) + u'$');
+            QVERIFY2(named.match(spreadsheet.documentPath()).hasMatch(),
+                     qPrintable(spreadsheet.documentPath()));
+            QCOMPARE(shell.documents, QStringList{spreadsheet.documentPath()});
+        }
+        QCOMPARE(dir.entryList(QDir::AllEntries | QDir::System | QDir::NoDotAndDotDot).size(),
+                 2 * taken + !name.isEmpty());
     }
 
     void workbook_data()

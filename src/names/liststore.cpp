@@ -113,7 +113,8 @@ const char* clearStatement(ListKind kind)
 
 QString moreRejected(int count)
 {
-    return u"%1 more names of this file were not stored."_s.arg(count);
+    return count == 1 ? u"1 more name of this file was not stored."_s
+                      : u"%1 more names of this file were not stored."_s.arg(count);
 }
 
 QString nameToStore(const QString& typed, const ListChoice& choice)
