@@ -138,7 +138,10 @@ Layout layoutOf(RowFormat format)
 
 char* copyBytes(char* out, QByteArrayView bytes)
 {
-    std::memcpy(out, bytes.data(), std::size_t(bytes.size()));
+    // An empty piece (no header, nothing before a name) may have no data
+    // pointer at all, which memcpy must not be handed.
+    if (!bytes.isEmpty())
+        std::memcpy(out, bytes.data(), std::size_t(bytes.size()));
     return out + bytes.size();
 }
 
