@@ -74,6 +74,17 @@ void setIndexedRows(ResultsModel& model, const Names& names)
     model.setRows(generated);
 }
 
+// What work throws as a failure: its text, empty for none.
+QString failureOf(const std::function<void()>& work)
+{
+    try {
+        work();
+    } catch (const Failure& failure) {
+        return failure.description();
+    }
+    return {};
+}
+
 QByteArray readAll(const QString& path)
 {
     QFile file(path);
@@ -124,14 +135,9 @@ const QString NamesDatabase = u"it is the names database, whose lists the result
 // workbook as quillane-cli saves one; the failure's text, empty for none.
 QString saveAs(bool workbook, const QString& path, const QString& database, const ResultRows& rows)
 {
-    if (workbook) {
-        try {
-            saveWorkbook(rows, OutputChoice::SpreadsheetTwoCells, path, database);
-            return {};
-        } catch (const Failure& failure) {
-            return failure.description();
-        }
-    }
+    if (workbook)
+        return failureOf(
+            [&] { saveWorkbook(rows, OutputChoice::SpreadsheetTwoCells, path, database); });
     FakeDialogs dialogs;
     FakeShell shell;
     dialogs.answerSave(path);
@@ -380,13 +386,12 @@ private Q_SLOTS:
         QFETCH(bool, workbook);
         QFETCH(Target, target);
         QFETCH(QString, error);
-        const bool root = ::geteuid() == 0;
-        if ((target == Target::NullDevice || target == Target::FullDevice) && !root)
-            QSKIP("Only root makes device nodes.");
-        if (target == Target::PlantedLink && !root)
-            QSKIP("Only root gives a link to another user.");
-        if (target == Target::ReadOnly && !root)
-            QSKIP("Needs root to run a child as an unprivileged user (root writes any file).");
+        const QList<Target> rootOnly{Target::PlantedLink, Target::ReadOnly,
+                                     Target::NullDevice,  Target::FullDevice,
+                                     Target::DiskFull,    Target::FewRowsDiskFull};
+        if (::geteuid() != 0 && rootOnly.contains(target))
+            QSKIP("Needs root: to make a device node, give a link to another user, mount a small "
+                  "file system, or run a child as an unprivileged user (root writes any file).");
 
         QTemporaryDir dir;
         const QByteArray folder = QFile::encodeName(dir.path());
@@ -396,8 +401,6 @@ private Q_SLOTS:
                 ::umount2(folder.constData(), MNT_DETACH);
         });
         if (target == Target::DiskFull || target == Target::FewRowsDiskFull) {
-            if (!root)
-                QSKIP("Only root mounts a small file system.");
             mounted = ::mount("tmpfs", folder.constData(), "tmpfs", 0, "size=256k") == 0;
             if (!mounted)
                 QSKIP("No small file system can be mounted here.");
@@ -522,10 +525,9 @@ private Q_SLOTS:
         }
         QCOMPARE(errors.readAll(), QByteArray());
 
-        if (error.isEmpty())
-            QCOMPARE(failure, QString());
-        else
-            QCOMPARE(failure, u"The file %1 could not be saved: %2"_s.arg(path, error));
+        QCOMPARE(failure, error.isEmpty()
+                              ? QString()
+                              : u"The file %1 could not be saved: %2"_s.arg(path, error));
 
         const QByteArray text("Ann Lee\r\nBob Stone\r\n");
         const QString cells = u"A1 Ann,B1 Lee,A2 Bob,B2 Stone"_s;
@@ -584,14 +586,11 @@ private Q_SLOTS:
         QFETCH(int, length);
         QTemporaryDir dir;
         const QString path = dir.filePath(u"out.xlsx"_s);
-        QString error;
-        try {
+        const QString error = failureOf([&] {
             WorkbookFile book(std::make_unique<SafeFile>(path));
             book.sheet().cells(row, column) = QString(length, u'x');
             book.save();
-        } catch (const Failure& failure) {
-            error = failure.description();
-        }
+        });
         QTEST(error, "error");
         QCOMPARE(entries(dir.path()), error.isEmpty() ? QStringList{u"out.xlsx"_s} : QStringList());
     }
@@ -622,8 +621,7 @@ private Q_SLOTS:
         QTemporaryDir dir;
         const QString folder = dir.filePath(u"cache"_s);
         FakeShell shell;
-        QString failure;
-        try {
+        const QString failure = failureOf([&] {
             SpreadsheetApplication spreadsheet(shell, folder);
             for (const QString& call : calls.split(u' ')) {
                 if (call == u"add")
@@ -635,9 +633,7 @@ private Q_SLOTS:
                 else
                     spreadsheet.setVisible(call == u"show");
             }
-        } catch (const Failure& f) {
-            failure = f.description();
-        }
+        });
         QFETCH(QString, error);
         QVERIFY2(error.isEmpty() ? failure.isEmpty() : failure.endsWith(error),
                  qPrintable(failure));
@@ -688,24 +684,20 @@ private Q_SLOTS:
         }
         FakeShell shell;
         SpreadsheetApplication spreadsheet(shell, dir.path());
-        QString failure;
-        try {
+        const QString failure = failureOf([&] {
             spreadsheet.Workbooks().Add();
             spreadsheet.setVisible(true);
-        } catch (const Failure& f) {
-            failure = f.description();
-        }
-        if (name.isEmpty()) {
+        });
+        const QRegularExpression named(u"/Quillane names [0-9. -]{19}"_s
+                                       + QRegularExpression::escape(name) + u'$');
+        if (name.isEmpty())
             QCOMPARE(failure,
                      u"The folder %1 holds too many workbooks of this second"_s.arg(dir.path()));
-            QCOMPARE(shell.documents, QStringList());
-        } else {
-            const QRegularExpression named(u"/Quillane names [0-9. -]{19}"_s
-                                           + QRegularExpression::escape(name) + u'$');
+        else
             QVERIFY2(named.match(spreadsheet.documentPath()).hasMatch(),
                      qPrintable(spreadsheet.documentPath()));
-            QCOMPARE(shell.documents, QStringList{spreadsheet.documentPath()});
-        }
+        QCOMPARE(shell.documents,
+                 name.isEmpty() ? QStringList() : QStringList{spreadsheet.documentPath()});
         QCOMPARE(dir.entryList(QDir::AllEntries | QDir::System | QDir::NoDotAndDotDot).size(),
                  2 * taken + !name.isEmpty());
     }
