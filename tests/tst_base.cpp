@@ -44,17 +44,11 @@ QByteArray bitmap(int bits)
     QByteArray info =
         with(with(with(with(QByteArray(40, '\0'), 0, 40, 4), 4, 2, 4), 8, 4, 4), 12, 1);
     info = with(info, 14, quint32(bits));
-    if (bits == 1) // palette, then the rows bottom up, each padded to 4 bytes
-        return info
-               + QByteArray::fromHex("ff000000"
-                                     "0000ff00"
-                                     "00000000"
-                                     "c0000000")
-               + QByteArray(8, '\0');
-    return info
-           + QByteArray::fromHex("ff0000ffffff0000"
-                                 "0000ff00ff000000")
-           + QByteArray(8, '\0');
+    // The palette of the 1-bit one, the rows bottom up, each padded to 4
+    // bytes, and the mask.
+    const QByteArray pixels =
+        bits == 1 ? "ff000000 0000ff00 00000000 c0000000" : "ff0000ffffff0000 0000ff00ff000000";
+    return info + QByteArray::fromHex(pixels) + QByteArray(8, '\0');
 }
 
 QString topRow(const QImage& image)
