@@ -22,6 +22,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
+const ListChoice User{false, true, true, false, false};
+
 // What an import of the bytes stores: the names the splitter finds in them
 // all at once, but for those too long to keep.
 QStringList storable(const QByteArray& bytes)
@@ -47,7 +49,7 @@ struct Rig {
     TestEnvironment env;
     const QString db = env.databasePath();
     FakePointer pointer;
-    ListChoice choice{false, true, true, false, false};
+    ListChoice choice = User;
     NameLists lists{db};
     ListEditor editor{env.dialogs, db, lists, pointer, [this] { return choice; }};
 };
@@ -366,23 +368,21 @@ private Q_SLOTS:
         QTest::addColumn<bool>("database"); // there is one
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<QStringList>("problems"); // step, culprit: description
-        const ListChoice user{false, true, true, false, false},
-            none{false, false, true, false, false};
-        const QString notAFile = u"%1 is not a file that names can be read from."_s;
-        QTest::newRow("missing") << u"missing.txt"_s << true << user
-                                 << QStringList{u"0 1: File not found"_s};
-        QTest::newRow("a folder") << u"folder"_s << true << user
-                                  << QStringList{u"2 1: "_s + notAFile.arg(u"%1/folder"_s)};
-        QTest::newRow("a FIFO") << u"fifo"_s << true << user
-                                << QStringList{u"2 1: "_s + notAFile.arg(u"%1/fifo"_s)};
+        const auto row = [](const char* tag, const QString& path, const QString& problem,
+                            bool database = true, ListChoice choice = User) {
+            QTest::newRow(tag) << path << database << choice
+                               << (problem.isEmpty() ? QStringList() : QStringList{problem});
+        };
+        const QString notAFile = u"2 1: %1/%2 is not a file that names can be read from."_s;
+        row("missing", u"missing.txt"_s, u"0 1: File not found"_s);
+        row("a folder", u"folder"_s, notAFile.arg(u"%1"_s, u"folder"_s));
+        row("a FIFO", u"fifo"_s, notAFile.arg(u"%1"_s, u"fifo"_s));
         // Write-only, even for root.
-        QTest::newRow("unreadable") << u"/proc/sys/vm/drop_caches"_s << true << user
-                                    << QStringList{u"2 1: The file /proc/sys/vm/drop_caches "
-                                                   u"cannot be read: Permission denied"_s};
-        QTest::newRow("no database") << u"names.txt"_s << false << user
-                                     << QStringList{u"1 2: %1/names.mdb: unable to open "
-                                                    u"database file"_s};
-        QTest::newRow("no list chosen") << u"names.txt"_s << true << none << QStringList();
+        row("unreadable", u"/proc/sys/vm/drop_caches"_s,
+            u"2 1: The file /proc/sys/vm/drop_caches cannot be read: Permission denied"_s);
+        row("no database", u"names.txt"_s, u"1 2: %1/names.mdb: unable to open database file"_s,
+            false);
+        row("no list chosen", u"names.txt"_s, {}, true, ListChoice{.builtIn = false});
     }
 
     void problemsBeforeTheFirstName()
@@ -423,16 +423,15 @@ private Q_SLOTS:
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<QStringList>("after"); // the first names when nothing fails
         QTest::addColumn<QString>("fault");     // the report's, after the database's name
-        const ListChoice user{false, true, true, false, false},
-            both{true, false, true, false, false};
+        const ListChoice both{true, false, true, false, false};
         const QStringList imported{u"Old"_s, u"Ann"_s, u"Bo"_s, u"Cy"_s};
         const QString io = u"disk I/O error"_s;
-        QTest::newRow("import") << 6 << user << imported << io;
-        QTest::newRow("add") << 2 << user << QStringList{u"Old"_s, u"Ann"_s} << io;
-        QTest::newRow("clear") << 4 << user << QStringList{} << io;
+        QTest::newRow("import") << 6 << User << imported << io;
+        QTest::newRow("add") << 2 << User << QStringList{u"Old"_s, u"Ann"_s} << io;
+        QTest::newRow("clear") << 4 << User << QStringList{} << io;
         QTest::newRow("delete") << 4 << both << QStringList{} << io;
-        QTest::newRow("import, disk full") << 6 << user << imported << Full;
-        QTest::newRow("import, read-only") << 6 << user << imported << ReadOnly;
+        QTest::newRow("import, disk full") << 6 << User << imported << Full;
+        QTest::newRow("import, read-only") << 6 << User << imported << ReadOnly;
     }
 
     void aFailingWriteLosesNothing()
@@ -526,23 +525,21 @@ private Q_SLOTS:
         QFETCH(int, failedStep);
         const int list = (user ? 3 : 1) + (button == 7); // index into DatabaseTables
         const QString table = DatabaseTables[list], column = DatabaseColumns[list];
-        TestEnvironment env(false);
-        const QString db = env.databasePath();
-        createEmptyDatabase(db);
+        Rig rig(m_empty);
+        rig.choice = ListChoice{!user, user, true, false, false};
+        const QString& db = rig.db;
         insertRows(db, table, column, {u"Old"_s});
         if (!index.isEmpty()) {
-            sqlite3* other = nullptr;
-            sqlite3_open(QFile::encodeName(db).constData(), &other);
+            Connection other(db);
             sqlite3_create_function_v2(
-                other, "quill", 1, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
+                other.handle(), "quill", 1, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
                 [](sqlite3_context* c, int, sqlite3_value** v) { sqlite3_result_value(c, v[0]); },
                 nullptr, nullptr, nullptr);
-            const QByteArray sql = (index == u"quill" ? u"create index quill on %1 (quill(%2))"_s
-                                                      : u"create unique index once on %1 (%2)"_s)
-                                       .arg(table, column)
-                                       .toUtf8();
-            QCOMPARE(sqlite3_exec(other, sql.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
-            sqlite3_close(other);
+            other.execute((index == u"quill" ? u"create index quill on %1 (quill(%2))"_s
+                                             : u"create unique index once on %1 (%2)"_s)
+                              .arg(table, column)
+                              .toUtf8()
+                              .constData());
         }
         const auto schema = [&] {
             QStringList entries = tableColumn(db, u"sqlite_master"_s, u"name || ifnull(sql, '')"_s);
@@ -560,16 +557,11 @@ private Q_SLOTS:
             bytes += names.last().toLatin1() + '\n';
         }
         QCOMPARE(bytes.size(), size);
-        writeBytes(env.filePath(u"names.txt"_s), bytes);
-        FakePointer pointer;
-        NameLists lists(db);
-        ListEditor editor(env.dialogs, db, lists, pointer, [&] {
-            return ListChoice{!user, user, true, false, false};
-        });
-        env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
-        button == 6 ? editor.PushButton6_Click() : editor.PushButton7_Click();
+        writeBytes(rig.env.filePath(u"names.txt"_s), bytes);
+        rig.env.dialogs.answerOpen({rig.env.filePath(u"names.txt"_s)});
+        button == 6 ? rig.editor.PushButton6_Click() : rig.editor.PushButton7_Click();
 
-        const QStringList messages = env.dialogs.messages();
+        const QStringList messages = rig.env.dialogs.messages();
         QCOMPARE(messages.size(), failedStep ? 1 : 0);
         if (failedStep) {
             QVERIFY2(messages[0].contains(index == u"quill" ? u"function: quill"_s
