@@ -222,7 +222,6 @@ private Q_SLOTS:
         row("Windows-1252", {"M\xFCller\n\x80uro\nZo\xEB"}, u"Müller|€uro|Zoë"_s);
         // A file that is not text is refused whole.
         row("a NUL", {QByteArray("A\0nn\nBo", 7)}, u""_s, notText);
-        row("UTF-16 without its mark", {QByteArray("Z\0o\0\n\0", 6)}, u""_s, notText);
         row("an escape", {"Ann\n\x1B[2J\nBo"}, u""_s, notText);
         QByteArray noise(2 << 20, Qt::Uninitialized);
         QRandomGenerator(42).fillRange(reinterpret_cast<quint32*>(noise.data()), noise.size() / 4);
@@ -263,17 +262,11 @@ private Q_SLOTS:
             (QStringList(17000, u"Ann"_s) << u"Bo"_s).join(u'|'));
         // A read that fails ends the file: the names read before it stay,
         // the one it cut is not stored.
-        const auto unread = [&](const char* tag, const QByteArray& file, const QString& names,
-                                int read) {
-            row(tag, {file}, names,
-                {errorReportText(u"The file %1/0.txt could not be read to its end: Input/output "
-                                 u"error"_s,
-                                 at, 40, Long)},
-                {}, read);
-        };
-        unread("a read error at the start", "Ann\nBo\n", u""_s, 1);
-        unread("a read error mid-file", pad + "Ann\nBo\nCy", pads + u"|Ann"_s, 2);
-        unread("a read error cutting a name", pad + "Annabel\nBo", pads, 2);
+        const QStringList unread{errorReportText(
+            u"The file %1/0.txt could not be read to its end: Input/output error"_s, at, 40, Long)};
+        row("a read error at the start", {"Ann\nBo\n"}, u""_s, unread, {}, 1);
+        row("a read error mid-file", {pad + "Ann\nBo\nCy"}, pads + u"|Ann"_s, unread, {}, 2);
+        row("a read error cutting a name", {pad + "Annabel\nBo"}, pads, unread, {}, 2);
         // 255 characters (UTF-16 code units) at most, however many bytes.
         const auto longest = [&](const QString& name) {
             return refused(u"The name \"%1...\" is longer than 255 characters and was not "
@@ -298,16 +291,16 @@ private Q_SLOTS:
         const auto bad = [](int count) -> QByteArray {
             return "Ann\n" + QByteArray("Bad\n").repeated(count) + "Cy";
         };
-        row("9 refused", {bad(9)}, u"Ann|Cy"_s, QStringList(9, refused(u"no"_s)), refuseBad);
-        row("10 refused", {bad(10)}, u"Ann|Cy"_s, QStringList(10, refused(u"no"_s)), refuseBad);
-        row("11 refused", {bad(11)}, u"Ann|Cy"_s,
-            QStringList(10, refused(u"no"_s))
-                << errorReportText(u"1 more name of this file was not stored."_s, at, 60, Long),
-            refuseBad);
-        row("25 refused", {bad(25)}, u"Ann|Cy"_s,
-            QStringList(10, refused(u"no"_s))
-                << errorReportText(u"15 more names of this file were not stored."_s, at, 60, Long),
-            refuseBad);
+        const QStringList ten(10, refused(u"no"_s));
+        const auto more = [&](const QString& text) {
+            return ten + QStringList{errorReportText(text, at, 60, Long)};
+        };
+        const QString oneMore = u"1 more name of this file was not stored."_s;
+        const QString fifteenMore = u"15 more names of this file were not stored."_s;
+        row("9 refused", {bad(9)}, u"Ann|Cy"_s, ten.mid(1), refuseBad);
+        row("10 refused", {bad(10)}, u"Ann|Cy"_s, ten, refuseBad);
+        row("11 refused", {bad(11)}, u"Ann|Cy"_s, more(oneMore), refuseBad);
+        row("25 refused", {bad(25)}, u"Ann|Cy"_s, more(fifteenMore), refuseBad);
         // A rule that undoes the whole transaction ends the import: nothing stays.
         row("a rule that rolls back", {"Ann\nBad\nCy"}, u""_s,
             {errorReportText(u"%1/names.mdb: no"_s, at, 50, Long)},
@@ -325,11 +318,10 @@ private Q_SLOTS:
         sqlite3_open(QFile::encodeName(rig.db).constData(), &second);
         QCOMPARE(sqlite3_exec(second, other.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
         QStringList paths;
-        for (const QByteArray& bytes : files) {
-            QFile file(rig.env.filePath(u"%1.txt"_s.arg(paths.size())));
-            QVERIFY(bytes.isNull()
-                    || (file.open(QIODevice::WriteOnly) && file.write(bytes) == bytes.size()));
-            paths += file.fileName();
+        for (const QByteArray& bytes : files) { // a null one is missing
+            paths += rig.env.filePath(u"%1.txt"_s.arg(paths.size()));
+            if (!bytes.isNull())
+                writeBytes(paths.last(), bytes);
         }
         rig.env.dialogs.answerOpen(paths);
         QFETCH(int, failingRead);
