@@ -498,7 +498,6 @@ private Q_SLOTS:
         QTest::addColumn<int>("failedStep"); // the one report's; 0: none
         const qint64 bulk = 4 << 20;
         const QString none, quill = u"quill"_s, unique = u"unique"_s;
-        QTest::newRow("just below") << bulk - 1 << 6 << true << none << 0;
         QTest::newRow("at") << bulk << 6 << true << none << 0;
         QTest::newRow("above, built-in first names") << bulk + 1 << 6 << false << none << 0;
         QTest::newRow("at, built-in last names") << bulk << 7 << false << none << 0;

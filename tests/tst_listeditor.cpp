@@ -232,7 +232,6 @@ private Q_SLOTS:
                                << QStringList{m, f} << failures;
         };
         row("no gender chosen", noGender, bo, true, "", false, both, both);
-        row("no names", Both, {}, true, "", false, both, both);
         row("an absent name ignored", Both, boZed, false, "", false, ann, ann);
         row("an absent name refused", Both, boZed, true, "", false, both, both,
             {u"\"Zed\" is not in the list: nothing was deleted."_s});
