@@ -140,7 +140,7 @@ private Q_SLOTS:
 
     // Typed names, all of them or none: every one is checked before the
     // list changes. 255 characters (UTF-16 code units) at most, counted
-    // after the apostrophes go.
+    // after the apostrophes go (the limit's every side: tst_import).
     void addingSeveralNames_data()
     {
         QTest::addColumn<QStringList>("typed");
@@ -158,10 +158,8 @@ private Q_SLOTS:
                             bool joined = false) {
             QTest::newRow(tag) << typed << choice << stored << failure << joined;
         };
-        row("254 and 255 characters", {x254, x254 + u'y'}, u"Old|"_s + x254 + u'|' + x254 + u'y');
-        row("256 characters", {u"Ann"_s, x254 + u"yz"_s}, u"Old"_s, tooLong(x254));
         row("255 code units in 128 characters", {a127}, u"Old|"_s + a127);
-        row("256 code units", {a127 + u'b'}, u"Old"_s, tooLong(a127));
+        row("256 code units", {u"Ann"_s, a127 + u'b'}, u"Old"_s, tooLong(a127));
         row("255 once the apostrophes go", {x254 + u"'y'"_s}, u"Old|"_s + x254 + u'y');
         row("a CR", {u"Ann"_s, u"Ann\rLee"_s}, u"Old"_s,
             u"The name \"Ann\\rLee\" holds a control character and was not stored."_s);
