@@ -7,24 +7,22 @@
 #include "support/fakepointer.h"
 #include "support/testenvironment.h"
 
-#include <QProcess>
 #include <QRandomGenerator>
 #include <QTest>
 
 #include <dlfcn.h>
 #include <sqlite3.h>
-#include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/types.h>
-#include <unistd.h>
 
 #include <cerrno>
-#include <csignal>
 #include <optional>
 
 using namespace Qt::StringLiterals;
 
 namespace {
+
+const ListChoice User{false, true, true, false, false};
 
 // What an import of the bytes stores: the names the splitter finds in them
 // all at once, but for those too long to keep.
@@ -51,21 +49,24 @@ struct Rig {
     TestEnvironment env;
     const QString db = env.databasePath();
     FakePointer pointer;
-    ListChoice choice{false, true, true, false, false};
+    ListChoice choice = User;
     NameLists lists{db};
     ListEditor editor{env.dialogs, db, lists, pointer, [this] { return choice; }};
 };
 
 // A file system over the system's own that fails one write when armed: the
-// n-th write after arming returns an I/O error, as a failing disk would,
-// and every other call goes through. Registered as the default, so the
-// program's own connections use it.
+// n-th write after arming returns an error, as a failing or full disk would,
+// and every other call goes through. Or it opens each database read-only, as
+// the system does a file that may not be written. Registered as the default,
+// so the program's own connections use it.
 namespace FaultyDisk {
 
 sqlite3_vfs* system = nullptr;
 sqlite3_vfs vfs;
 sqlite3_io_methods methods;
 int writesToFail = 0; // 0: none
+int failWith = SQLITE_IOERR_WRITE;
+bool readOnly = false;
 bool failed = false;
 
 struct File {
@@ -78,13 +79,26 @@ sqlite3_file* real(sqlite3_file* file)
     return reinterpret_cast<File*>(file)->real;
 }
 
+// The system's own method of the file, called for it.
+template <auto Method>
+struct Forward;
+template <typename... Args, int (*sqlite3_io_methods::*Method)(sqlite3_file*, Args...)>
+struct Forward<Method> {
+    static int call(sqlite3_file* file, Args... args)
+    {
+        return (real(file)->pMethods->*Method)(real(file), args...);
+    }
+};
+template <auto Method>
+constexpr auto forward = Forward<Method>::call;
+
 int write(sqlite3_file* file, const void* data, int amount, sqlite3_int64 offset)
 {
     if (writesToFail > 0 && --writesToFail == 0) {
         failed = true;
-        return SQLITE_IOERR_WRITE;
+        return failWith;
     }
-    return real(file)->pMethods->xWrite(real(file), data, amount, offset);
+    return forward<&sqlite3_io_methods::xWrite>(file, data, amount, offset);
 }
 
 int open(sqlite3_vfs*, const char* name, sqlite3_file* base, int flags, int* outFlags)
@@ -92,6 +106,10 @@ int open(sqlite3_vfs*, const char* name, sqlite3_file* base, int flags, int* out
     auto* file = reinterpret_cast<File*>(base);
     file->real = reinterpret_cast<sqlite3_file*>(file + 1);
     base->pMethods = nullptr;
+    if (readOnly && (flags & SQLITE_OPEN_MAIN_DB)) {
+        failed = true;
+        flags = (flags & ~(SQLITE_OPEN_READWRITE | SQLITE_OPEN_CREATE)) | SQLITE_OPEN_READONLY;
+    }
     const int rc = system->xOpen(system, name, file->real, flags, outFlags);
     if (file->real->pMethods)
         base->pMethods = &methods;
@@ -111,36 +129,18 @@ void install()
     // Version 1: no memory mapping and no shared memory, so every write of
     // the rollback journal and of the database passes through write().
     methods.iVersion = 1;
-    methods.xClose = [](sqlite3_file* f) { return real(f)->pMethods->xClose(real(f)); };
-    methods.xRead = [](sqlite3_file* f, void* data, int amount, sqlite3_int64 offset) {
-        return real(f)->pMethods->xRead(real(f), data, amount, offset);
-    };
+    methods.xClose = forward<&sqlite3_io_methods::xClose>;
+    methods.xRead = forward<&sqlite3_io_methods::xRead>;
     methods.xWrite = write;
-    methods.xTruncate = [](sqlite3_file* f, sqlite3_int64 size) {
-        return real(f)->pMethods->xTruncate(real(f), size);
-    };
-    methods.xSync = [](sqlite3_file* f, int flags) {
-        return real(f)->pMethods->xSync(real(f), flags);
-    };
-    methods.xFileSize = [](sqlite3_file* f, sqlite3_int64* size) {
-        return real(f)->pMethods->xFileSize(real(f), size);
-    };
-    methods.xLock = [](sqlite3_file* f, int lock) {
-        return real(f)->pMethods->xLock(real(f), lock);
-    };
-    methods.xUnlock = [](sqlite3_file* f, int lock) {
-        return real(f)->pMethods->xUnlock(real(f), lock);
-    };
-    methods.xCheckReservedLock = [](sqlite3_file* f, int* out) {
-        return real(f)->pMethods->xCheckReservedLock(real(f), out);
-    };
-    methods.xFileControl = [](sqlite3_file* f, int op, void* arg) {
-        return real(f)->pMethods->xFileControl(real(f), op, arg);
-    };
-    methods.xSectorSize = [](sqlite3_file* f) { return real(f)->pMethods->xSectorSize(real(f)); };
-    methods.xDeviceCharacteristics = [](sqlite3_file* f) {
-        return real(f)->pMethods->xDeviceCharacteristics(real(f));
-    };
+    methods.xTruncate = forward<&sqlite3_io_methods::xTruncate>;
+    methods.xSync = forward<&sqlite3_io_methods::xSync>;
+    methods.xFileSize = forward<&sqlite3_io_methods::xFileSize>;
+    methods.xLock = forward<&sqlite3_io_methods::xLock>;
+    methods.xUnlock = forward<&sqlite3_io_methods::xUnlock>;
+    methods.xCheckReservedLock = forward<&sqlite3_io_methods::xCheckReservedLock>;
+    methods.xFileControl = forward<&sqlite3_io_methods::xFileControl>;
+    methods.xSectorSize = forward<&sqlite3_io_methods::xSectorSize>;
+    methods.xDeviceCharacteristics = forward<&sqlite3_io_methods::xDeviceCharacteristics>;
     sqlite3_vfs_register(&vfs, 1);
 }
 
@@ -171,6 +171,9 @@ extern "C" ssize_t read(int fd, void* data, size_t size)
 
 class TestImport : public QObject {
     Q_OBJECT
+
+    const QString Full = u"database or disk is full"_s;
+    const QString ReadOnly = u"attempt to write a readonly database"_s;
 
     // A names database without names: copied faster than the shipped one,
     // and the user list reads the same from it.
@@ -207,8 +210,6 @@ private Q_SLOTS:
             u"The file %1/0.txt is not text: it holds control characters. Nothing of it was "
             u"stored."_s,
             at, 40, Long)};
-        QStringList refusals(ListEditor::MaxReportsPerFile, refused(u"no"_s));
-        refusals += errorReportText(u"15 more names of this file were not stored."_s, at, 60, Long);
         row("LF only, no final line end", {"Ann\nBo\nCy"}, u"Ann|Bo|Cy"_s);
         row("CR only", {"Ann\rBo\rCy\r"}, u"Ann|Bo|Cy"_s);
         row("CR LF, final line end", {"Ann\r\nBo\r\nCy\r\n"}, u"Ann|Bo|Cy"_s);
@@ -221,7 +222,6 @@ private Q_SLOTS:
         row("Windows-1252", {"M\xFCller\n\x80uro\nZo\xEB"}, u"Müller|€uro|Zoë"_s);
         // A file that is not text is refused whole.
         row("a NUL", {QByteArray("A\0nn\nBo", 7)}, u""_s, notText);
-        row("UTF-16 without its mark", {QByteArray("Z\0o\0\n\0", 6)}, u""_s, notText);
         row("an escape", {"Ann\n\x1B[2J\nBo"}, u""_s, notText);
         QByteArray noise(2 << 20, Qt::Uninitialized);
         QRandomGenerator(42).fillRange(reinterpret_cast<quint32*>(noise.data()), noise.size() / 4);
@@ -241,11 +241,6 @@ private Q_SLOTS:
             {errorReportText(locked, at, 30, Long),
              errorReportText(locked, u"in Tessmark.Form1.PushButton6_Click "_s, 30, Long)},
             "begin exclusive");
-        row("rejected names",
-            {"Ann\n" + QByteArray("Bad\n").repeated(ListEditor::MaxReportsPerFile + 15) + "Cy"},
-            u"Ann|Cy"_s, refusals,
-            "create trigger refuse before insert on user_firstname when new.firstname = 'Bad' "
-            "begin select raise(abort, 'no'); end");
         // Read in pieces: the names are those of the whole file split at
         // once, and the reports are bounded.
         row("across reads", {QByteArray("\xC3\xAB\n").repeated(100000)}, {});
@@ -267,17 +262,11 @@ private Q_SLOTS:
             (QStringList(17000, u"Ann"_s) << u"Bo"_s).join(u'|'));
         // A read that fails ends the file: the names read before it stay,
         // the one it cut is not stored.
-        const auto unread = [&](const char* tag, const QByteArray& file, const QString& names,
-                                int read) {
-            row(tag, {file}, names,
-                {errorReportText(u"The file %1/0.txt could not be read to its end: Input/output "
-                                 u"error"_s,
-                                 at, 40, Long)},
-                {}, read);
-        };
-        unread("a read error at the start", "Ann\nBo\n", u""_s, 1);
-        unread("a read error mid-file", pad + "Ann\nBo\nCy", pads + u"|Ann"_s, 2);
-        unread("a read error cutting a name", pad + "Annabel\nBo", pads, 2);
+        const QStringList unread{errorReportText(
+            u"The file %1/0.txt could not be read to its end: Input/output error"_s, at, 40, Long)};
+        row("a read error at the start", {"Ann\nBo\n"}, u""_s, unread, {}, 1);
+        row("a read error mid-file", {pad + "Ann\nBo\nCy"}, pads + u"|Ann"_s, unread, {}, 2);
+        row("a read error cutting a name", {pad + "Annabel\nBo"}, pads, unread, {}, 2);
         // 255 characters (UTF-16 code units) at most, however many bytes.
         const auto longest = [&](const QString& name) {
             return refused(u"The name \"%1...\" is longer than 255 characters and was not "
@@ -302,12 +291,16 @@ private Q_SLOTS:
         const auto bad = [](int count) -> QByteArray {
             return "Ann\n" + QByteArray("Bad\n").repeated(count) + "Cy";
         };
-        row("9 refused", {bad(9)}, u"Ann|Cy"_s, QStringList(9, refused(u"no"_s)), refuseBad);
-        row("10 refused", {bad(10)}, u"Ann|Cy"_s, QStringList(10, refused(u"no"_s)), refuseBad);
-        row("11 refused", {bad(11)}, u"Ann|Cy"_s,
-            QStringList(10, refused(u"no"_s))
-                << errorReportText(u"1 more name of this file was not stored."_s, at, 60, Long),
-            refuseBad);
+        const QStringList ten(10, refused(u"no"_s));
+        const auto more = [&](const QString& text) {
+            return ten + QStringList{errorReportText(text, at, 60, Long)};
+        };
+        const QString oneMore = u"1 more name of this file was not stored."_s;
+        const QString fifteenMore = u"15 more names of this file were not stored."_s;
+        row("9 refused", {bad(9)}, u"Ann|Cy"_s, ten.mid(1), refuseBad);
+        row("10 refused", {bad(10)}, u"Ann|Cy"_s, ten, refuseBad);
+        row("11 refused", {bad(11)}, u"Ann|Cy"_s, more(oneMore), refuseBad);
+        row("25 refused", {bad(25)}, u"Ann|Cy"_s, more(fifteenMore), refuseBad);
         // A rule that undoes the whole transaction ends the import: nothing stays.
         row("a rule that rolls back", {"Ann\nBad\nCy"}, u""_s,
             {errorReportText(u"%1/names.mdb: no"_s, at, 50, Long)},
@@ -325,11 +318,10 @@ private Q_SLOTS:
         sqlite3_open(QFile::encodeName(rig.db).constData(), &second);
         QCOMPARE(sqlite3_exec(second, other.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
         QStringList paths;
-        for (const QByteArray& bytes : files) {
-            QFile file(rig.env.filePath(u"%1.txt"_s.arg(paths.size())));
-            QVERIFY(bytes.isNull()
-                    || (file.open(QIODevice::WriteOnly) && file.write(bytes) == bytes.size()));
-            paths += file.fileName();
+        for (const QByteArray& bytes : files) { // a null one is missing
+            paths += rig.env.filePath(u"%1.txt"_s.arg(paths.size()));
+            if (!bytes.isNull())
+                writeBytes(paths.last(), bytes);
         }
         rig.env.dialogs.answerOpen(paths);
         QFETCH(int, failingRead);
@@ -368,23 +360,21 @@ private Q_SLOTS:
         QTest::addColumn<bool>("database"); // there is one
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<QStringList>("problems"); // step, culprit: description
-        const ListChoice user{false, true, true, false, false},
-            none{false, false, true, false, false};
-        const QString notAFile = u"%1 is not a file that names can be read from."_s;
-        QTest::newRow("missing") << u"missing.txt"_s << true << user
-                                 << QStringList{u"0 1: File not found"_s};
-        QTest::newRow("a folder") << u"folder"_s << true << user
-                                  << QStringList{u"2 1: "_s + notAFile.arg(u"%1/folder"_s)};
-        QTest::newRow("a FIFO") << u"fifo"_s << true << user
-                                << QStringList{u"2 1: "_s + notAFile.arg(u"%1/fifo"_s)};
+        const auto row = [](const char* tag, const QString& path, const QString& problem,
+                            bool database = true, ListChoice choice = User) {
+            QTest::newRow(tag) << path << database << choice
+                               << (problem.isEmpty() ? QStringList() : QStringList{problem});
+        };
+        const QString notAFile = u"2 1: %1/%2 is not a file that names can be read from."_s;
+        row("missing", u"missing.txt"_s, u"0 1: File not found"_s);
+        row("a folder", u"folder"_s, notAFile.arg(u"%1"_s, u"folder"_s));
+        row("a FIFO", u"fifo"_s, notAFile.arg(u"%1"_s, u"fifo"_s));
         // Write-only, even for root.
-        QTest::newRow("unreadable") << u"/proc/sys/vm/drop_caches"_s << true << user
-                                    << QStringList{u"2 1: The file /proc/sys/vm/drop_caches "
-                                                   u"cannot be read: Permission denied"_s};
-        QTest::newRow("no database") << u"names.txt"_s << false << user
-                                     << QStringList{u"1 2: %1/names.mdb: unable to open "
-                                                    u"database file"_s};
-        QTest::newRow("no list chosen") << u"names.txt"_s << true << none << QStringList();
+        row("unreadable", u"/proc/sys/vm/drop_caches"_s,
+            u"2 1: The file /proc/sys/vm/drop_caches cannot be read: Permission denied"_s);
+        row("no database", u"names.txt"_s, u"1 2: %1/names.mdb: unable to open database file"_s,
+            false);
+        row("no list chosen", u"names.txt"_s, {}, true, ListChoice{.builtIn = false});
     }
 
     void problemsBeforeTheFirstName()
@@ -415,20 +405,25 @@ private Q_SLOTS:
     }
 
     // Every write of a small import, a clear and a delete fails in turn, as
-    // SQLite's own tests fail them: the operation is reported once, naming
-    // the database, and the database holds what it held before (an import
-    // may keep the file's first names, never a later one) and is whole.
+    // SQLite's own tests fail them, or the disk is full at that write, or the
+    // database is read-only: the operation is reported once, naming the
+    // database and what failed, and the database holds what it held before
+    // and is whole.
     void aFailingWriteLosesNothing_data()
     {
         QTest::addColumn<int>("button"); // 6 imports, 2 adds, 4 clears or deletes first names
         QTest::addColumn<ListChoice>("choice");
         QTest::addColumn<QStringList>("after"); // the first names when nothing fails
-        const ListChoice user{false, true, true, false, false},
-            both{true, false, true, false, false};
-        QTest::newRow("import") << 6 << user << QStringList{u"Old"_s, u"Ann"_s, u"Bo"_s, u"Cy"_s};
-        QTest::newRow("add") << 2 << user << QStringList{u"Old"_s, u"Ann"_s};
-        QTest::newRow("clear") << 4 << user << QStringList{};
-        QTest::newRow("delete") << 4 << both << QStringList{};
+        QTest::addColumn<QString>("fault");     // the report's, after the database's name
+        const ListChoice both{true, false, true, false, false};
+        const QStringList imported{u"Old"_s, u"Ann"_s, u"Bo"_s, u"Cy"_s};
+        const QString io = u"disk I/O error"_s;
+        QTest::newRow("import") << 6 << User << imported << io;
+        QTest::newRow("add") << 2 << User << QStringList{u"Old"_s, u"Ann"_s} << io;
+        QTest::newRow("clear") << 4 << User << QStringList{} << io;
+        QTest::newRow("delete") << 4 << both << QStringList{} << io;
+        QTest::newRow("import, disk full") << 6 << User << imported << Full;
+        QTest::newRow("import, read-only") << 6 << User << imported << ReadOnly;
     }
 
     void aFailingWriteLosesNothing()
@@ -436,6 +431,7 @@ private Q_SLOTS:
         QFETCH(int, button);
         QFETCH(ListChoice, choice);
         QFETCH(QStringList, after);
+        QFETCH(QString, fault);
         FaultyDisk::install();
         const QString table = choice.user ? u"user_firstname"_s : u"system_ffirstname"_s;
         const QString male = u"system_mfirstname"_s;
@@ -457,12 +453,16 @@ private Q_SLOTS:
             rig.env.dialogs.answerInput(u"Ann"_s);
 
             FaultyDisk::failed = false;
-            FaultyDisk::writesToFail = write;
+            // Read-only: the first pass only.
+            FaultyDisk::readOnly = fault == ReadOnly && write == 1;
+            FaultyDisk::writesToFail = fault == ReadOnly ? 0 : write;
+            FaultyDisk::failWith = fault == Full ? SQLITE_FULL : SQLITE_IOERR_WRITE;
             if (button == 2)
                 rig.editor.PushButton2_Click();
             else
                 button == 6 ? rig.editor.PushButton6_Click() : rig.editor.PushButton4_Click(0);
             FaultyDisk::writesToFail = 0;
+            FaultyDisk::readOnly = false;
 
             const QStringList messages = rig.env.dialogs.messages();
             const QStringList names = tableColumn(rig.db, table, u"*"_s);
@@ -474,14 +474,11 @@ private Q_SLOTS:
                 break;
             }
             QCOMPARE(messages.size(), 1);
-            QVERIFY2(messages[0].startsWith(rig.db + u": disk I/O error"_s),
-                     qPrintable(messages[0]));
-            QCOMPARE(names.mid(0, before.size()), before);
-            // A first part of the file's names at most.
-            QVERIFY(names == before || after.mid(0, names.size()) == names);
+            QVERIFY2(messages[0].startsWith(rig.db + u": "_s + fault), qPrintable(messages[0]));
+            QCOMPARE(names, before);
             QCOMPARE(tableColumn(rig.db, male, u"*"_s), QStringList{u"Old"_s});
         }
-        QVERIFY(write > 3); // there were writes to fail
+        QVERIFY(write > 1); // there was a fault
     }
 
     // A file of 4 MiB or more has its names stored while the list's indexes
@@ -501,7 +498,6 @@ private Q_SLOTS:
         QTest::addColumn<int>("failedStep"); // the one report's; 0: none
         const qint64 bulk = 4 << 20;
         const QString none, quill = u"quill"_s, unique = u"unique"_s;
-        QTest::newRow("just below") << bulk - 1 << 6 << true << none << 0;
         QTest::newRow("at") << bulk << 6 << true << none << 0;
         QTest::newRow("above, built-in first names") << bulk + 1 << 6 << false << none << 0;
         QTest::newRow("at, built-in last names") << bulk << 7 << false << none << 0;
@@ -520,23 +516,21 @@ private Q_SLOTS:
         QFETCH(int, failedStep);
         const int list = (user ? 3 : 1) + (button == 7); // index into DatabaseTables
         const QString table = DatabaseTables[list], column = DatabaseColumns[list];
-        TestEnvironment env(false);
-        const QString db = env.databasePath();
-        createEmptyDatabase(db);
+        Rig rig(m_empty);
+        rig.choice = ListChoice{!user, user, true, false, false};
+        const QString& db = rig.db;
         insertRows(db, table, column, {u"Old"_s});
         if (!index.isEmpty()) {
-            sqlite3* other = nullptr;
-            sqlite3_open(QFile::encodeName(db).constData(), &other);
+            Connection other(db);
             sqlite3_create_function_v2(
-                other, "quill", 1, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
+                other.handle(), "quill", 1, SQLITE_UTF8 | SQLITE_DETERMINISTIC, nullptr,
                 [](sqlite3_context* c, int, sqlite3_value** v) { sqlite3_result_value(c, v[0]); },
                 nullptr, nullptr, nullptr);
-            const QByteArray sql = (index == u"quill" ? u"create index quill on %1 (quill(%2))"_s
-                                                      : u"create unique index once on %1 (%2)"_s)
-                                       .arg(table, column)
-                                       .toUtf8();
-            QCOMPARE(sqlite3_exec(other, sql.constData(), nullptr, nullptr, nullptr), SQLITE_OK);
-            sqlite3_close(other);
+            other.execute((index == u"quill" ? u"create index quill on %1 (quill(%2))"_s
+                                             : u"create unique index once on %1 (%2)"_s)
+                              .arg(table, column)
+                              .toUtf8()
+                              .constData());
         }
         const auto schema = [&] {
             QStringList entries = tableColumn(db, u"sqlite_master"_s, u"name || ifnull(sql, '')"_s);
@@ -554,16 +548,11 @@ private Q_SLOTS:
             bytes += names.last().toLatin1() + '\n';
         }
         QCOMPARE(bytes.size(), size);
-        writeBytes(env.filePath(u"names.txt"_s), bytes);
-        FakePointer pointer;
-        NameLists lists(db);
-        ListEditor editor(env.dialogs, db, lists, pointer, [&] {
-            return ListChoice{!user, user, true, false, false};
-        });
-        env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
-        button == 6 ? editor.PushButton6_Click() : editor.PushButton7_Click();
+        writeBytes(rig.env.filePath(u"names.txt"_s), bytes);
+        rig.env.dialogs.answerOpen({rig.env.filePath(u"names.txt"_s)});
+        button == 6 ? rig.editor.PushButton6_Click() : rig.editor.PushButton7_Click();
 
-        const QStringList messages = env.dialogs.messages();
+        const QStringList messages = rig.env.dialogs.messages();
         QCOMPARE(messages.size(), failedStep ? 1 : 0);
         if (failedStep) {
             QVERIFY2(messages[0].contains(index == u"quill" ? u"function: quill"_s
@@ -576,75 +565,6 @@ private Q_SLOTS:
             QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
         QCOMPARE(tableColumn(db, table, column), index == u"quill" ? QStringList{u"Old"_s} : names);
         QCOMPARE(schema(), before);
-    }
-
-    // A full disk or a read-only database, on a small file system of the
-    // test's own where the tests run as root (else under a limit on the size
-    // of the files this process writes, or with the write permission taken
-    // away): the import ends with one report that names the database and
-    // says what failed, and nothing of the file is stored.
-    void aFaultOfTheDiskEndsTheImport_data()
-    {
-        QTest::addColumn<QString>("error");
-        QTest::newRow("full") << u"database or disk is full"_s;
-        QTest::newRow("read-only") << u"attempt to write a readonly database"_s;
-    }
-
-    void aFaultOfTheDiskEndsTheImport()
-    {
-        QFETCH(QString, error);
-        const bool full = error == u"database or disk is full";
-        TestEnvironment env(false);
-        const QString disk = env.filePath(u"disk"_s);
-        QVERIFY(QDir().mkpath(disk));
-        struct Mount {
-            QString folder;
-            bool mounted = geteuid() == 0
-                           && QProcess::execute(u"mount"_s, {u"-t"_s, u"tmpfs"_s, u"-o"_s,
-                                                             u"size=256k"_s, u"tmpfs"_s, folder})
-                                  == 0;
-            ~Mount()
-            {
-                if (mounted)
-                    QProcess::execute(u"umount"_s, {folder});
-            }
-        } mount{disk};
-        const QString db = disk + u"/names.mdb"_s;
-        createEmptyDatabase(db);
-        QByteArray names;
-        for (int i = 0; i < 40000; ++i)
-            names += "Quillon" + QByteArray::number(i) + '\n';
-        writeBytes(env.filePath(u"names.txt"_s), names);
-        FakePointer pointer;
-        NameLists lists(db);
-        ListEditor editor(env.dialogs, db, lists, pointer, [] {
-            return ListChoice{false, true, true, false, false};
-        });
-        env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
-
-        rlimit limit{};
-        getrlimit(RLIMIT_FSIZE, &limit);
-        const rlimit unlimited = limit;
-        if (!full && mount.mounted) {
-            QCOMPARE(QProcess::execute(u"mount"_s, {u"-o"_s, u"remount,ro"_s, disk}), 0);
-        } else if (!full) {
-            QVERIFY(QFile::setPermissions(db, QFile::ReadOwner));
-            QVERIFY(QFile::setPermissions(disk, QFile::ReadOwner | QFile::ExeOwner));
-        } else if (!mount.mounted) {
-            std::signal(SIGXFSZ, SIG_IGN);
-            limit.rlim_cur = QFileInfo(db).size() + 64 * 1024;
-            QCOMPARE(setrlimit(RLIMIT_FSIZE, &limit), 0);
-            error.clear(); // the system says "file too large" or the disk is full
-        }
-        editor.PushButton6_Click();
-        setrlimit(RLIMIT_FSIZE, &unlimited);
-        QFile::setPermissions(disk, QFile::ReadOwner | QFile::WriteOwner | QFile::ExeOwner);
-
-        const QStringList messages = env.dialogs.messages();
-        QCOMPARE(messages.size(), 1);
-        QVERIFY2(messages[0].startsWith(db + u": "_s + error), qPrintable(messages[0]));
-        QVERIFY(tableColumn(db, u"user_firstname"_s, u"*"_s).isEmpty());
-        QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
     }
 };
 
