@@ -7,15 +7,19 @@
 #include "support/fakepointer.h"
 #include "support/testenvironment.h"
 
+#include <QProcess>
 #include <QRandomGenerator>
+#include <QScopeGuard>
 #include <QTest>
 
 #include <dlfcn.h>
 #include <sqlite3.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
 #include <sys/types.h>
 
 #include <cerrno>
+#include <csignal>
 #include <optional>
 
 using namespace Qt::StringLiterals;
@@ -565,6 +569,56 @@ private Q_SLOTS:
             QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
         QCOMPARE(tableColumn(db, table, column), index == u"quill" ? QStringList{u"Old"_s} : names);
         QCOMPARE(schema(), before);
+    }
+
+    // A full disk met for real, not injected: a small file system of the
+    // test's own where the tests run as root, else a limit on the size of
+    // the files this process writes. The import ends with one report that
+    // names the database, and nothing of the file is stored.
+    void aFullDiskEndsTheImport()
+    {
+        TestEnvironment env(false);
+        const QString disk = env.filePath(u"disk"_s);
+        QVERIFY(QDir().mkpath(disk));
+        const bool mounted = geteuid() == 0
+                             && QProcess::execute(u"mount"_s, {u"-t"_s, u"tmpfs"_s, u"-o"_s,
+                                                               u"size=256k"_s, u"tmpfs"_s, disk})
+                                    == 0;
+        const auto unmount = qScopeGuard([&] {
+            if (mounted)
+                QProcess::execute(u"umount"_s, {disk});
+        });
+        const QString db = disk + u"/names.mdb"_s;
+        createEmptyDatabase(db);
+        QByteArray names;
+        for (int i = 0; i < 40000; ++i)
+            names += "Quillon" + QByteArray::number(i) + '\n';
+        writeBytes(env.filePath(u"names.txt"_s), names);
+        FakePointer pointer;
+        NameLists lists(db);
+        ListEditor editor(env.dialogs, db, lists, pointer, [] {
+            return ListChoice{false, true, true, false, false};
+        });
+        env.dialogs.answerOpen({env.filePath(u"names.txt"_s)});
+
+        rlimit limit{};
+        getrlimit(RLIMIT_FSIZE, &limit);
+        const rlimit unlimited = limit;
+        if (!mounted) {
+            std::signal(SIGXFSZ, SIG_IGN);
+            limit.rlim_cur = QFileInfo(db).size() + 64 * 1024;
+            QCOMPARE(setrlimit(RLIMIT_FSIZE, &limit), 0);
+        }
+        editor.PushButton6_Click();
+        setrlimit(RLIMIT_FSIZE, &unlimited);
+
+        const QStringList messages = env.dialogs.messages();
+        QCOMPARE(messages.size(), 1);
+        // The system says the disk is full, or that the file grew too large.
+        QVERIFY2(messages[0].startsWith(db + (mounted ? u": database or disk is full"_s : u": "_s)),
+                 qPrintable(messages[0]));
+        QVERIFY(tableColumn(db, u"user_firstname"_s, u"*"_s).isEmpty());
+        QCOMPARE(tableColumn(db, u"pragma_integrity_check"_s, u"*"_s), QStringList{u"ok"_s});
     }
 };
 
