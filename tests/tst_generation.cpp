@@ -5,8 +5,6 @@
 #include "generate/namerun.h"
 #include "support/randomindex.h"
 
-#include "base/failure.h"
-
 #include <QTest>
 
 #include <cmath>
@@ -14,6 +12,19 @@
 #include <set>
 
 using namespace Qt::StringLiterals;
+
+namespace {
+
+// A pane of names that are numbers: 0, 1, ...
+QStringList pane(int names)
+{
+    QStringList pane;
+    for (int i = 0; i < names; ++i)
+        pane.append(QString::number(i));
+    return pane;
+}
+
+} // namespace
 
 class TestGeneration : public QObject {
     Q_OBJECT
@@ -99,11 +110,9 @@ private Q_SLOTS:
     {
         constexpr int Names = 400000;
         for (const int items : {1, 2, 7, 97}) {
-            QStringList pane;
-            for (int i = 0; i < items; ++i)
-                pane.append(QString::number(i));
             RandomSource random;
-            const GeneratedNames names = NameGenerator(pane, pane, random).generate(Names);
+            const GeneratedNames names =
+                NameGenerator(pane(items), pane(items), random).generate(Names);
             QList<int> drawn(2 * items);
             for (const NamePair& row : names.rows) {
                 ++drawn[names.firstNames.at(row.first).toInt()];
@@ -129,10 +138,9 @@ private Q_SLOTS:
     void progressFollowsTheRun()
     {
         QFETCH(int, count);
-        const QStringList pane{u"a"_s, u"b"_s};
         RandomSource random;
         QList<int> seen;
-        NameGenerator(pane, pane, random).generate(count, [&](int v) { seen.append(v); });
+        NameGenerator(pane(2), pane(2), random).generate(count, [&](int v) { seen.append(v); });
         QTEST(seen, "values");
     }
 
@@ -165,26 +173,6 @@ private Q_SLOTS:
             reference.jump(first + second);
         }
         QCOMPARE(jumped.nextBits(), reference.nextBits());
-    }
-
-    // Any part of a streamed run holds the window's names for the same seed.
-    void aRunsPartsAreTheWindowsNames()
-    {
-        const QStringList firsts{u"ann"_s, u"BOB"_s, u" cy "_s, u"dee"_s, u"eve"_s};
-        const QStringList lasts{u"SMITH"_s, u"o'brien"_s, u"lee"_s};
-        RandomSource random;
-        random.seed(7);
-        const NameRun run(firsts, lasts, random, {.count = 3000});
-        const GeneratedNames window = NameGenerator(firsts, lasts, random).generate(3000);
-        for (const std::int64_t from : {0, 1, 999, 2950}) {
-            std::vector<NamePair> pairs(50);
-            run.pairs(from, pairs);
-            for (std::size_t i = 0; i < pairs.size(); ++i) {
-                const NamePair& row = window.rows[std::size_t(from) + i];
-                QCOMPARE(run.firstNames().at(pairs[i].first), window.firstNames.at(row.first));
-                QCOMPARE(run.lastNames().at(pairs[i].last), window.lastNames.at(row.last));
-            }
-        }
     }
 
     // Shards one after another are the whole run, each starting on a unit.
@@ -260,12 +248,8 @@ private Q_SLOTS:
         QFETCH(int, lasts);
         QFETCH(int, rows);
         constexpr int Seeds = 20000;
-        QStringList firstPane;
-        for (int i = 0; i < firsts; ++i)
-            firstPane.append(u"f%1"_s.arg(i));
-        QStringList lastPane;
-        for (int i = 0; i < lasts; ++i)
-            lastPane.append(u"l%1"_s.arg(i));
+        const QStringList firstPane = pane(firsts);
+        const QStringList lastPane = pane(lasts);
         const int pairs = firsts * lasts;
         std::vector<int> drawn(static_cast<std::size_t>(pairs));
         std::vector<NamePair> made(static_cast<std::size_t>(rows));
@@ -286,24 +270,6 @@ private Q_SLOTS:
         for (const int n : drawn)
             QVERIFY2(std::abs(n - Seeds * share) < 5 * sigma,
                      qPrintable(u"%1 of %2"_s.arg(n).arg(Seeds * share)));
-    }
-
-    // Names that tidy alike are one name: asking for more pairs than the
-    // different names make is refused with the number they make.
-    void distinctPairsCountNamesAsPrinted()
-    {
-        const QStringList firsts{u"mary ann"_s, u"Maryann"_s, u"BOB"_s, u"bob"_s};
-        const QStringList lasts{u"lee"_s, u"Lee"_s, u"moss"_s};
-        const NameRun run(firsts, lasts, RandomSource(), {.count = 4, .unique = true});
-        QCOMPARE(run.firstNames(), (QStringList{u"Maryann"_s, u"Bob"_s}));
-        QCOMPARE(run.lastNames(), (QStringList{u"Lee"_s, u"Moss"_s}));
-        try {
-            NameRun(firsts, lasts, RandomSource(), {.count = 5, .unique = true});
-            QFAIL("five distinct names out of four");
-        } catch (const Failure& failure) {
-            QCOMPARE(failure.description(),
-                     u"These lists make 4 different names: ask for at most 4, not 5."_s);
-        }
     }
 };
 
