@@ -30,34 +30,12 @@ using namespace Qt::StringLiterals;
 namespace {
 
 struct Run {
-    int status = -1;
+    int status;
     QByteArray out;
     QByteArray err;
 };
 
 const QString Cli = QStringLiteral(QUILLANE_CLI);
-
-// Runs quillane-cli with the arguments as a shell would take them: a first
-// LC_ALL=LOCALE is the user's number format (else C), a last >FILE receives
-// standard output.
-Run cli(QStringList arguments)
-{
-    QProcess process;
-    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
-    environment.insert(u"LC_ALL"_s, arguments.value(0).startsWith(u"LC_ALL=")
-                                        ? arguments.takeFirst().mid(7)
-                                        : u"C.UTF-8"_s);
-    if (arguments.value(arguments.size() - 1).startsWith(u'>'))
-        process.setStandardOutputFile(arguments.takeLast().mid(1));
-    process.setProcessEnvironment(environment);
-    process.start(Cli, arguments);
-    process.waitForFinished(60000);
-    Run run;
-    run.status = process.exitStatus() == QProcess::NormalExit ? process.exitCode() : -1;
-    run.out = process.readAllStandardOutput();
-    run.err = process.readAllStandardError();
-    return run;
-}
 
 // The peak resident memory, in kB, of quillane-cli run with the arguments
 // and its standard output thrown away; -1 when it did not end well.
@@ -132,14 +110,27 @@ class TestCli : public QObject {
     QString db; // the copy of the shipped database every run works on
     QString output() const { return env->filePath(u"out.txt"_s); }
 
-    // Runs the companion on the test's database, unless it names one.
+    // Runs quillane-cli on the test's database, unless the arguments name
+    // one, and as a shell would take them: a first LC_ALL=LOCALE is the
+    // user's number format (else C), a last >FILE receives standard output.
     Run run(QStringList arguments)
     {
+        QProcess process;
+        QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+        environment.insert(u"LC_ALL"_s, arguments.value(0).startsWith(u"LC_ALL=")
+                                            ? arguments.takeFirst().mid(7)
+                                            : u"C.UTF-8"_s);
+        process.setProcessEnvironment(environment);
+        if (arguments.value(arguments.size() - 1).startsWith(u'>'))
+            process.setStandardOutputFile(arguments.takeLast().mid(1));
         if (!arguments.isEmpty() && std::ranges::none_of(arguments, [](const QString& argument) {
                 return argument.startsWith(u"--database");
             }))
             arguments.insert(1, u"--database=%1"_s.arg(db));
-        return cli(arguments);
+        process.start(Cli, arguments);
+        process.waitForFinished(60000);
+        return {process.exitStatus() == QProcess::NormalExit ? process.exitCode() : -1,
+                process.readAllStandardOutput(), process.readAllStandardError()};
     }
 
 private Q_SLOTS:
