@@ -8,7 +8,6 @@
 #include "support/program.h"
 #include "support/workbook.h"
 
-#include <QButtonGroup>
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <QLineEdit>
@@ -16,7 +15,6 @@
 #include <QRadioButton>
 #include <QRegularExpression>
 #include <QStandardPaths>
-#include <QTableView>
 
 #include <fcntl.h>
 #include <spawn.h>
@@ -67,13 +65,10 @@ long peakKilobytes(const QStringList& arguments)
 QList<QStringList> readBack(const QByteArray& printed)
 {
     QList<QStringList> rows;
-    for (const QByteArray& line : printed.split('\n')) {
-        if (line.isEmpty())
-            continue;
-        QStringList row;
+    for (const QByteArray& line : printed.trimmed().split('\n')) {
+        QStringList& row = rows.emplace_back();
         for (const QJsonValue& value : QJsonDocument::fromJson(line).array())
             row.append(value.toString());
-        rows.append(row);
     }
     return rows;
 }
