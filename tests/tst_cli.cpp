@@ -363,13 +363,10 @@ private Q_SLOTS:
         QCOMPARE(lines(run(words("names first --list user")).out),
                  (QStringList{u" Ann Lee "_s, u"oNeil"_s}));
 
-        writeBytes(env->filePath(u"a.txt"_s), "Reed\r\nMoss\n\nFenwick");
-        writeBytes(env->filePath(u"b.txt"_s), "\xEF\xBB\xBFHollin\n");
-        QCOMPARE(run(QStringList{u"import"_s, u"last"_s, env->filePath(u"a.txt"_s),
-                                 env->filePath(u"b.txt"_s)}
-                     + user)
-                     .status,
-                 0);
+        const QStringList files{env->filePath(u"a.txt"_s), env->filePath(u"b.txt"_s)};
+        writeBytes(files[0], "Reed\r\nMoss\n\nFenwick");
+        writeBytes(files[1], "\xEF\xBB\xBFHollin\n");
+        QCOMPARE(run(words("import last") + files + user).status, 0);
         QCOMPARE(
             tableColumn(db, u"user_lastname"_s, u"lastname"_s),
             (QStringList{u"Quill, \"Jr\""_s, u"Reed"_s, u"Moss"_s, u"Fenwick"_s, u"Hollin"_s}));
