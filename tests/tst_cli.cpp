@@ -174,7 +174,9 @@ private Q_SLOTS:
         row("--database=%1/names.mdb --database %1/names.mdb names last", 2,
             "--database is given more than once.");
         row("-h --help", 2, "--help is given more than once.");
+        row("--version --version", 2, "--version is given more than once.");
         row("--database= names last", 2, "--database needs a file name.");
+        row("names last --database=", 2, "--database needs a file name.");
         row("generate -n 3 -o=", 2, "-o needs a file name, or '-' for standard output.");
         row("generate", 2, "How many? Give -n COUNT.");
         row("generate -n ten", 2, "How many does not appear to be a number.");
@@ -201,6 +203,8 @@ private Q_SLOTS:
         row("generate -n 3 --format pdf", 2,
             "--format is text, lines, csv, tsv, jsonl, sql, xlsx2 or xlsx1, not 'pdf'.");
         row("generate -n 3 --format sql --table=", 2, "--table needs a name.");
+        row("generate -n 3 -o %1/out.xlsx --table t", 2,
+            "--table names the table of the sql format.");
         row("generate -n 3 --table t --format csv", 2,
             "--table names the table of the sql format.");
         row("generate -n 3 --format xlsx1", 2, "A workbook is written to a file: give -o FILE.");
