@@ -11,6 +11,7 @@
 #include "results/textfile.h"
 #include "support/fakedialogs.h"
 #include "support/fakeplatform.h"
+#include "support/program.h"
 #include "support/workbook.h"
 
 #include <QDateTime>
@@ -166,11 +167,11 @@ QString asNobody(const std::function<QString()>& work)
         ::close(channel[0]);
         if (::setgroups(0, nullptr) != 0 || ::setgid(nobody->pw_gid) != 0
             || ::setuid(nobody->pw_uid) != 0)
-            ::_exit(2);
+            leaveChild(2);
         const QByteArray answer = work().toUtf8();
         const bool sent =
             ::write(channel[1], answer.constData(), std::size_t(answer.size())) == answer.size();
-        ::_exit(sent ? 0 : 1);
+        leaveChild(sent ? 0 : 1);
     }
     ::close(channel[1]);
     QFile answer;

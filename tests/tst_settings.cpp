@@ -175,7 +175,7 @@ int useStoreUnprivileged(int&, char** argv)
                 qUtf8Printable(reports.join(u'|')));
     // Ended without the store's destructor: what is in the file was written at once.
     std::fflush(stdout);
-    ::_exit(0);
+    leaveChild(0);
 }
 
 } // namespace
